@@ -1,0 +1,33 @@
+#include "DemoWindow.h"
+
+#include "zubase/Command.h"
+
+#include <QLabel>
+#include <QPixmap>
+#include <QPlainTextEdit>
+#include <QTabWidget>
+#include <QVBoxLayout>
+
+DemoWindow::DemoWindow(QWidget* inParent) : QMainWindow(inParent)
+{
+    setWindowTitle(tr("zubase demo"));
+    auto* tabs = new QTabWidget(this);
+
+    auto* usagePage = new QWidget(tabs);
+    auto* usageLayout = new QVBoxLayout(usagePage);
+    usageLayout->addWidget(new QLabel(tr("Command line of this host:"), usagePage));
+    auto* usage = new QPlainTextEdit(usagePage);
+    usage->setReadOnly(true);
+    usage->setPlainText(ZuBase::Command::usage(QString(), false));
+    usageLayout->addWidget(usage);
+    tabs->addTab(usagePage, tr("Commands"));
+
+    setCentralWidget(tabs);
+    resize(720, 520);
+}
+
+bool DemoWindow::saveScreenshot(const QString& inPath)
+{
+    ensurePolished();
+    return grab().save(inPath, "PNG");
+}

@@ -1,0 +1,10 @@
+#include "pnresources/PnResourceLayer.h"
+
+namespace PnResourceLayer {
+
+int interfaceVersion()
+{
+    return 1;
+}
+
+} // namespace PnResourceLayer

@@ -1,0 +1,8 @@
+#include "rklib/RkHandle.h"
+
+RkHandable::~RkHandable() = default;
+
+void RkHandable::notifyDelete()
+{
+    delete this;
+}

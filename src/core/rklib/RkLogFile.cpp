@@ -1,0 +1,298 @@
+#include "rklib/RkLogFile.h"
+
+#include <cstdarg>
+#include <cstdio>
+#include <cstdlib>
+#include <ctime>
+#include <map>
+#include <sys/syscall.h>
+#include <unistd.h>
+
+namespace {
+
+thread_local int tCallbackDisabled = 0;
+
+std::string vformat(const char* inFormat, va_list inArgs)
+{
+    if (!inFormat)
+        return std::string();
+    va_list copy;
+    va_copy(copy, inArgs);
+    char buffer[512];
+    const int needed = std::vsnprintf(buffer, sizeof buffer, inFormat, copy);
+    va_end(copy);
+    if (needed < 0)
+        return std::string();
+    if (std::size_t(needed) < sizeof buffer)
+        return std::string(buffer, std::size_t(needed));
+    std::string text(std::size_t(needed), '\0');
+    std::vsnprintf(text.data(), std::size_t(needed) + 1, inFormat, inArgs);
+    return text;
+}
+
+long currentThreadId()
+{
+    return long(::syscall(SYS_gettid));
+}
+
+} // namespace
+
+struct RkLogFile::Private
+{
+    std::mutex outputMutex;
+    std::FILE* output = stderr;
+    bool ownsOutput = false;
+    RkLogLevel outputLevel = RkLogInfo;
+
+    std::mutex sinkMutex;
+    std::map<int, std::shared_ptr<Sink>> sinks;
+    int nextSinkId = 1;
+    WriteCallback callback = nullptr;
+    RkLogLevel callbackLevel = RkLogOff;
+};
+
+RkLogFile::RkLogFile() : d(new Private)
+{
+    if (const char* level = std::getenv("ZUBASE_LOG_LEVEL"); level && *level) {
+        const int value = std::atoi(level);
+        if (value >= RkLogDebug && value <= RkLogOff)
+            d->outputLevel = RkLogLevel(value);
+    }
+    if (const char* path = std::getenv("ZUBASE_LOG_FILE"); path && *path)
+        setOutputFile(path);
+}
+
+RkLogFile::~RkLogFile()
+{
+    if (d->ownsOutput)
+        std::fclose(d->output);
+}
+
+void RkLogFile::printf(const char* inFormat, ...)
+{
+    va_list args;
+    va_start(args, inFormat);
+    write(RkLogInfo, "", vformat(inFormat, args));
+    va_end(args);
+}
+
+void RkLogFile::warnf(const char* inFormat, ...)
+{
+    va_list args;
+    va_start(args, inFormat);
+    write(RkLogWarning, "", vformat(inFormat, args));
+    va_end(args);
+}
+
+void RkLogFile::errorf(const char* inFormat, ...)
+{
+    va_list args;
+    va_start(args, inFormat);
+    write(RkLogError, "", vformat(inFormat, args));
+    va_end(args);
+}
+
+void RkLogFile::tracef(RkLogLevel inLevel, const char* inCategory, const char* inFormat, ...)
+{
+    va_list args;
+    va_start(args, inFormat);
+    write(inLevel, inCategory, vformat(inFormat, args));
+    va_end(args);
+}
+
+void RkLogFile::print(const char* inCategory, const char* inText)
+{
+    write(RkLogInfo, inCategory, inText ? inText : "");
+}
+
+void RkLogFile::write(RkLogLevel inLevel, const char* inCategory, const std::string& inText)
+{
+    RkLogEntry entry;
+    entry.time = std::chrono::system_clock::now();
+    entry.thread = currentThreadId();
+    entry.level = inLevel;
+    entry.category = inCategory ? inCategory : "";
+    entry.text = inText;
+
+    if (inLevel >= d->outputLevel && inLevel < RkLogOff) {
+        const std::string line = formatLine(entry) + '\n';
+        std::lock_guard<std::mutex> lock(d->outputMutex);
+        std::fwrite(line.data(), 1, line.size(), d->output);
+        std::fflush(d->output);
+    }
+
+    // Sinks and the callback run outside the lock so that they may log themselves.
+    std::vector<std::shared_ptr<Sink>> sinks;
+    WriteCallback callback = nullptr;
+    {
+        std::lock_guard<std::mutex> lock(d->sinkMutex);
+        sinks.reserve(d->sinks.size());
+        for (const auto& sink : d->sinks)
+            sinks.push_back(sink.second);
+        if (inLevel >= d->callbackLevel && tCallbackDisabled == 0)
+            callback = d->callback;
+    }
+    for (const auto& sink : sinks)
+        (*sink)(entry);
+    if (callback)
+        callback(inLevel, RkString(entry.text));
+}
+
+void RkLogFile::setWriteCallback(WriteCallback inCallback, RkLogLevel inLevel)
+{
+    std::lock_guard<std::mutex> lock(d->sinkMutex);
+    d->callback = inCallback;
+    d->callbackLevel = inCallback ? inLevel : RkLogOff;
+}
+
+void RkLogFile::setOutputLevel(RkLogLevel inLevel)
+{
+    std::lock_guard<std::mutex> lock(d->outputMutex);
+    d->outputLevel = inLevel;
+}
+
+RkLogLevel RkLogFile::outputLevel() const
+{
+    return d->outputLevel;
+}
+
+bool RkLogFile::setOutputFile(const std::string& inPath)
+{
+    std::FILE* file = stderr;
+    if (!inPath.empty()) {
+        file = std::fopen(inPath.c_str(), "a");
+        if (!file)
+            return false;
+    }
+    std::lock_guard<std::mutex> lock(d->outputMutex);
+    if (d->ownsOutput)
+        std::fclose(d->output);
+    d->output = file;
+    d->ownsOutput = file != stderr;
+    return true;
+}
+
+int RkLogFile::addSink(Sink inSink)
+{
+    std::lock_guard<std::mutex> lock(d->sinkMutex);
+    const int id = d->nextSinkId++;
+    d->sinks.emplace(id, std::make_shared<Sink>(std::move(inSink)));
+    return id;
+}
+
+void RkLogFile::removeSink(int inId)
+{
+    std::lock_guard<std::mutex> lock(d->sinkMutex);
+    d->sinks.erase(inId);
+}
+
+std::string RkLogFile::formatLine(const RkLogEntry& inEntry)
+{
+    static const char levelLetters[] = "DIWEF-";
+    const std::time_t seconds = std::chrono::system_clock::to_time_t(inEntry.time);
+    const auto millis = std::chrono::duration_cast<std::chrono::milliseconds>(
+                            inEntry.time.time_since_epoch())
+                            .count() %
+                        1000;
+    std::tm local{};
+    localtime_r(&seconds, &local);
+    char stamp[64];
+    std::snprintf(stamp, sizeof stamp, "%04d-%02d-%02d %02d:%02d:%02d.%03d [%ld] %c ",
+                  local.tm_year + 1900, local.tm_mon + 1, local.tm_mday, local.tm_hour,
+                  local.tm_min, local.tm_sec, int(millis), inEntry.thread,
+                  levelLetters[inEntry.level >= 0 && inEntry.level <= RkLogOff ? inEntry.level : 5]);
+    std::string line = stamp;
+    if (!inEntry.category.empty())
+        line += inEntry.category + ": ";
+    line += inEntry.text;
+    return line;
+}
+
+RkLogFile& getTheLogInstance()
+{
+    // Never destroyed: static destructors of other libraries may still log.
+    static RkLogFile* const instance = new RkLogFile;
+    return *instance;
+}
+
+RkLogFileWriteCallbackDisabler::~RkLogFileWriteCallbackDisabler()
+{
+    restoreWriteCallback();
+}
+
+void RkLogFileWriteCallbackDisabler::disableWriteCallback()
+{
+    if (!mDisabled) {
+        mDisabled = true;
+        ++tCallbackDisabled;
+    }
+}
+
+void RkLogFileWriteCallbackDisabler::restoreWriteCallback()
+{
+    if (mDisabled) {
+        mDisabled = false;
+        --tCallbackDisabled;
+    }
+}
+
+RkLogCapture::RkLogCapture()
+{
+    mSinkId = getTheLogInstance().addSink([this](const RkLogEntry& inEntry) {
+        std::lock_guard<std::mutex> lock(mMutex);
+        mEntries.push_back(inEntry);
+    });
+}
+
+RkLogCapture::~RkLogCapture()
+{
+    getTheLogInstance().removeSink(mSinkId);
+}
+
+std::vector<RkLogEntry> RkLogCapture::entries() const
+{
+    std::lock_guard<std::mutex> lock(mMutex);
+    return mEntries;
+}
+
+std::vector<std::string> RkLogCapture::texts() const
+{
+    std::lock_guard<std::mutex> lock(mMutex);
+    std::vector<std::string> result;
+    result.reserve(mEntries.size());
+    for (const RkLogEntry& entry : mEntries)
+        result.push_back(entry.text);
+    return result;
+}
+
+std::vector<std::string> RkLogCapture::texts(const std::string& inCategory) const
+{
+    std::lock_guard<std::mutex> lock(mMutex);
+    std::vector<std::string> result;
+    for (const RkLogEntry& entry : mEntries) {
+        if (entry.category == inCategory)
+            result.push_back(entry.text);
+    }
+    return result;
+}
+
+std::vector<std::string> RkLogCapture::lines() const
+{
+    static const char levelLetters[] = "DIWEF-";
+    std::lock_guard<std::mutex> lock(mMutex);
+    std::vector<std::string> result;
+    for (const RkLogEntry& entry : mEntries) {
+        std::string line(1, levelLetters[entry.level >= 0 && entry.level <= RkLogOff ? entry.level : 5]);
+        line += ' ';
+        if (!entry.category.empty())
+            line += entry.category + ": ";
+        result.push_back(line + entry.text);
+    }
+    return result;
+}
+
+void RkLogCapture::clear()
+{
+    std::lock_guard<std::mutex> lock(mMutex);
+    mEntries.clear();
+}
