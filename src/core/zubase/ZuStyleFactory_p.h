@@ -1,0 +1,42 @@
+#pragma once
+
+// Internal: the factory's private record and its theme-change observer.
+
+#include <QColor>
+#include <QMap>
+#include <QPalette>
+#include <QString>
+
+class QEvent;
+class QObject;
+
+// One colour scheme as read from its file.
+struct ZuColorScheme
+{
+    QString styleClass;
+    QPalette palette;
+    bool translateName = false; // kept for the host
+    int priority = 0;           // kept for the host; the table is ordered by name only
+    QMap<QString, QColor> userDefinedColors;
+};
+
+// Puts the scheme palette back when the desktop theme changes, whatever the receiver of the
+// ThemeChange event. It sees every event of the process, so it only compares the type.
+class ThemeChangeObserver
+{
+public:
+    ThemeChangeObserver() = default;
+    virtual ~ThemeChangeObserver();
+    virtual void beforeNotify(QObject* inReceiver, QEvent* inEvent);
+    virtual void afterNotify(QObject* inReceiver, QEvent* inEvent);
+};
+
+class ZuStyleFactoryPrivate
+{
+public:
+    QMap<QString, ZuColorScheme> schemes;
+    QString currentName;
+    QPalette nativePalette;
+    QString nativeStyleClass;
+    ThemeChangeObserver themeChangeObserver;
+};
