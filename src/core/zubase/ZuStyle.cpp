@@ -83,7 +83,9 @@ bool hasTabButtons(const QStyleOption* inOption)
     const auto* tab = qstyleoption_cast<const QStyleOptionTab*>(inOption);
     if (!tab || tab->version < 3)
         return false;
-    auto atLeastOne = [](const QSize& size) { return size.width() >= 1 && size.height() >= 1; };
+    auto atLeastOne = [](const QSize& size) {
+        return size.width() >= 1 && size.height() >= 1;
+    };
     return atLeastOne(tab->leftButtonSize) || atLeastOne(tab->rightButtonSize);
 }
 
@@ -93,8 +95,7 @@ ZuStyle::QLargeIconMenu::QLargeIconMenu(QWidget* inParent) : QMenu(inParent) {}
 
 ZuStyle::QLargeIconMenu::QLargeIconMenu(const QString& inTitle, QWidget* inParent)
     : QMenu(inTitle, inParent)
-{
-}
+{}
 
 ZuStyle::QLargeIconMenu::~QLargeIconMenu() = default;
 
@@ -133,11 +134,10 @@ QStyle* ZuStyle::innerStyle() const
 QString ZuStyle::pixmapCacheKey(const QString& inBaseKey, const QStyleOption* inOption,
                                 const QSize& inPixmapSize)
 {
-    QString key = QString::asprintf("%s-%d-%d-%lld-%dx%d", inBaseKey.toLatin1().constData(),
-                                    static_cast<int>(inOption->state),
-                                    static_cast<int>(inOption->direction),
-                                    static_cast<long long>(inOption->palette.cacheKey()),
-                                    inPixmapSize.width(), inPixmapSize.height());
+    QString key = QString::asprintf(
+        "%s-%d-%d-%lld-%dx%d", inBaseKey.toLatin1().constData(), static_cast<int>(inOption->state),
+        static_cast<int>(inOption->direction), static_cast<long long>(inOption->palette.cacheKey()),
+        inPixmapSize.width(), inPixmapSize.height());
     if (const auto* spin = qstyleoption_cast<const QStyleOptionSpinBox*>(inOption)) {
         key += QLatin1Char('-') + QString::number(spin->buttonSymbols) + QLatin1Char('-') +
                QString::number(static_cast<int>(spin->stepEnabled)) + QLatin1Char('-') +
@@ -229,8 +229,7 @@ QPixmap ZuStyle::generatedIconPixmap(QIcon::Mode inIconMode, const QPixmap& inPi
         auto* line = reinterpret_cast<QRgb*>(image.scanLine(y));
         for (int x = 0; x < image.width(); ++x) {
             const QRgb pixel = line[x];
-            const int grey =
-                qMin(255, (qRed(pixel) + qGreen(pixel) + qBlue(pixel)) / 15 + base);
+            const int grey = qMin(255, (qRed(pixel) + qGreen(pixel) + qBlue(pixel)) / 15 + base);
             line[x] = qRgba(grey, grey, grey, qAlpha(pixel));
         }
     }
@@ -265,8 +264,8 @@ void ZuStyle::drawPrimitive(PrimitiveElement inElement, const QStyleOption* inOp
         const QSize pixmapSize = r.size() * ratio;
         if (pixmapSize.isEmpty())
             return;
-        const QString key = pixmapCacheKey(
-            QStringLiteral("pushbutton-%1").arg(isDefault ? 1 : 0), inOption, pixmapSize);
+        const QString key = pixmapCacheKey(QStringLiteral("pushbutton-%1").arg(isDefault ? 1 : 0),
+                                           inOption, pixmapSize);
         QPixmap panel;
         if (!QPixmapCache::find(key, &panel)) {
             panel = QPixmap(pixmapSize);
@@ -410,8 +409,7 @@ void ZuStyle::drawControl(ControlElement inElement, const QStyleOption* inOption
     case CE_ToolButtonLabel: {
         // A negative icon size marks a tool button that must stay blank.
         const auto* toolButton = qstyleoption_cast<const QStyleOptionToolButton*>(inOption);
-        if (toolButton &&
-            (toolButton->iconSize.width() < 0 || toolButton->iconSize.height() < 0))
+        if (toolButton && (toolButton->iconSize.width() < 0 || toolButton->iconSize.height() < 0))
             return;
         break;
     }
@@ -447,10 +445,10 @@ void ZuStyle::drawTabShape(const QStyleOption* inOption, QPainter* inPainter,
                            const QWidget* inWidget) const
 {
     const auto* tab = qstyleoption_cast<const QStyleOptionTab*>(inOption);
-    const bool north = tab && (tab->shape == QTabBar::RoundedNorth ||
-                               tab->shape == QTabBar::TriangularNorth);
-    const bool south = tab && (tab->shape == QTabBar::RoundedSouth ||
-                               tab->shape == QTabBar::TriangularSouth);
+    const bool north =
+        tab && (tab->shape == QTabBar::RoundedNorth || tab->shape == QTabBar::TriangularNorth);
+    const bool south =
+        tab && (tab->shape == QTabBar::RoundedSouth || tab->shape == QTabBar::TriangularSouth);
     if (!north && !south) {
         QProxyStyle::drawControl(CE_TabBarTabShape, inOption, inPainter, inWidget);
         return;
@@ -605,8 +603,9 @@ void ZuStyle::drawMenuItem(const QStyleOption* inOption, QPainter* inPainter,
 
     const int textLeft = r.left() + 2 + checkColumn + 6;
     const int arrowSpace = 20;
-    const QRect textRect = visualRect(
-        item->direction, r, QRect(textLeft, r.top(), r.right() - arrowSpace - textLeft, r.height()));
+    const QRect textRect =
+        visualRect(item->direction, r,
+                   QRect(textLeft, r.top(), r.right() - arrowSpace - textLeft, r.height()));
     QFont font = item->font;
     if (item->menuItemType == QStyleOptionMenuItem::DefaultItem)
         font.setBold(true);

@@ -67,8 +67,7 @@ QDomElement firstBelow(const QDomElement& inRoot, const QString& inName)
     return inRoot.elementsByTagName(inName).item(0).toElement();
 }
 
-void applyGroup(const QDomElement& inGroup, QPalette::ColorGroup inColorGroup,
-                QPalette& ioPalette)
+void applyGroup(const QDomElement& inGroup, QPalette::ColorGroup inColorGroup, QPalette& ioPalette)
 {
     for (QDomElement entry = inGroup.firstChildElement(); !entry.isNull();
          entry = entry.nextSiblingElement()) {
@@ -86,6 +85,14 @@ void applyToTree(QWidget* inWidget, QStyle* inStyle, const QPalette& inPalette)
         if (auto* childWidget = qobject_cast<QWidget*>(child))
             applyToTree(childWidget, inStyle, inPalette);
     }
+}
+
+// A copy of the application palette marks no role as set, so a widget given it would simply
+// follow the application palette again; every role is marked so the tree keeps these colours.
+QPalette allRolesSet(QPalette inPalette)
+{
+    inPalette.resolve((1u << QPalette::NColorRoles) - 1);
+    return inPalette;
 }
 
 } // namespace
@@ -266,7 +273,7 @@ bool ZuStyleFactory::setStyleForWidget(const QString& inSchemeName, QWidget* inW
         return false;
     // Widgets do not own their style; the factory keeps it for the rest of the process.
     style->setParent(this);
-    applyToTree(inWidget, style, scheme->palette);
+    applyToTree(inWidget, style, allRolesSet(scheme->palette));
     return true;
 }
 
@@ -278,7 +285,7 @@ bool ZuStyleFactory::setNativeStyleForWidget(QWidget* inWidget)
     if (!style)
         return false;
     style->setParent(this);
-    applyToTree(inWidget, style, d->nativePalette);
+    applyToTree(inWidget, style, allRolesSet(d->nativePalette));
     return true;
 }
 

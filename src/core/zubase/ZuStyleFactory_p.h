@@ -2,6 +2,8 @@
 
 // Internal: the factory's private record and its theme-change observer.
 
+#include "zubase/ZuStyleFactory.h"
+
 #include <QColor>
 #include <QMap>
 #include <QPalette>
@@ -34,6 +36,8 @@ public:
 class ZuStyleFactoryPrivate
 {
 public:
+    static ZuStyleFactoryPrivate* get(ZuStyleFactory& inFactory) { return inFactory.d.get(); }
+
     QMap<QString, ZuColorScheme> schemes;
     QString currentName;
     QPalette nativePalette;

@@ -1,0 +1,556 @@
+// Colour-scheme files, the style factory's palettes and switching, and styled widgets.
+#include "zubase/ZuStyle.h"
+#include "zubase/ZuStyleFactory.h"
+#include "zubase/ZuStyleFactory_p.h"
+#include "zubase/ZuStyledWidget.h"
+
+#include "rklib/RkLogFile.h"
+
+#include <QApplication>
+#include <QPointer>
+#include <QStyleFactory>
+#include <QTemporaryDir>
+#include <QWidget>
+#include <QtTest>
+
+#include <memory>
+
+namespace {
+
+const QString sDataDir = QStringLiteral(ZUBASE_TEST_DATA_DIR "/style");
+
+// The sixteen roles a scheme file can set.
+const QList<QPalette::ColorRole> sFileRoles = {
+    QPalette::WindowText, QPalette::Button,    QPalette::Light,         QPalette::Midlight,
+    QPalette::Dark,       QPalette::Mid,       QPalette::ButtonText,    QPalette::HighlightedText,
+    QPalette::Shadow,     QPalette::Text,      QPalette::BrightText,    QPalette::Base,
+    QPalette::Window,     QPalette::Highlight, QPalette::AlternateBase, QPalette::Link};
+
+QString dataFile(const char* inName)
+{
+    return sDataDir + QLatin1Char('/') + QLatin1String(inName);
+}
+
+QString writeFile(const QTemporaryDir& inDir, const QString& inName, const QString& inText)
+{
+    const QString path = inDir.filePath(inName);
+    QFile file(path);
+    if (!file.open(QIODevice::WriteOnly))
+        return QString();
+    file.write(inText.toUtf8());
+    return path;
+}
+
+// A scheme with a name, an optional Active Midlight and one user-defined panel colour.
+QString schemeText(const QString& inName, const QColor& inMidlight, const QColor& inPanel,
+                   const QString& inExtraAttributes = QString())
+{
+    return QStringLiteral("<ColorScheme Version=\"1.0\" Name=\"%1\" %2>"
+                          "<Active><Color Id=\"Midlight\" Red=\"%3\" Green=\"%4\" Blue=\"%5\"/>"
+                          "<Color Id=\"Button\" Red=\"%6\" Green=\"%7\" Blue=\"%8\"/></Active>"
+                          "<UserDefined><Color Id=\"Panel\" Red=\"%6\" Green=\"%7\" Blue=\"%8\"/>"
+                          "</UserDefined></ColorScheme>")
+        .arg(inName, inExtraAttributes)
+        .arg(inMidlight.red())
+        .arg(inMidlight.green())
+        .arg(inMidlight.blue())
+        .arg(inPanel.red())
+        .arg(inPanel.green())
+        .arg(inPanel.blue());
+}
+
+QStringList warnings(const RkLogCapture& inCapture)
+{
+    QStringList texts;
+    for (const RkLogEntry& entry : inCapture.entries()) {
+        if (entry.level == RkLogWarning)
+            texts << QString::fromStdString(entry.text);
+    }
+    return texts;
+}
+
+const ZuColorScheme* scheme(const QString& inName)
+{
+    const auto* d = ZuStyleFactoryPrivate::get(ZuStyleFactory::instance());
+    const auto it = d->schemes.constFind(inName);
+    return it == d->schemes.constEnd() ? nullptr : &*it;
+}
+
+QString rgb(const QColor& inColor)
+{
+    return QStringLiteral("%1,%2,%3,%4")
+        .arg(inColor.red())
+        .arg(inColor.green())
+        .arg(inColor.blue())
+        .arg(inColor.alpha());
+}
+
+} // namespace
+
+class tst_StyleFactory : public QObject
+{
+    Q_OBJECT
+
+private slots:
+    void initTestCase();
+    void beforeAnyScheme();
+    void rejectedFiles_data();
+    void rejectedFiles();
+    void fullScheme();
+    void emptyInactiveKeepsStartingColours();
+    void translateName_data();
+    void translateName();
+    void nativeClass();
+    void sameNameReplacesWholeScheme();
+    void addStylesFromPath();
+    void setCurrentStyleSignalsOnce();
+    void paletteStartsFromCurrentScheme();
+    void tesselNative_data();
+    void tesselNative();
+    void osNative();
+    void styleForWidgetTree();
+    void themeChangeRestoresSchemePalette();
+    void styledWidgetColours_data();
+    void styledWidgetColours();
+    void styledWidgetFollowsSchemeSwitch();
+
+private:
+    QPalette mNativePalette;
+    QString mNativeClass;
+    QTemporaryDir mTemp;
+};
+
+void tst_StyleFactory::initTestCase()
+{
+    QVERIFY(mTemp.isValid());
+    mNativePalette = QGuiApplication::palette();
+    mNativeClass = QApplication::style()->objectName();
+    QVERIFY(!mNativeClass.isEmpty());
+    QCOMPARE(ZuStyleFactory::instance().count(), 0u);
+}
+
+void tst_StyleFactory::beforeAnyScheme()
+{
+    ZuStyleFactory& factory = ZuStyleFactory::instance();
+    QVERIFY(factory.currentStyle().isEmpty());
+    QCOMPARE(factory.userDefinedColor(QStringLiteral("Panel"), Qt::magenta), QColor(Qt::magenta));
+    QCOMPARE(factory.standardPalette(), QPalette());
+    QVERIFY(!factory.currentStyleIsOSNative());
+    QVERIFY(factory.showToolCardChooserButton());
+    QVERIFY(factory.showSplitterButton());
+}
+
+void tst_StyleFactory::rejectedFiles_data()
+{
+    QTest::addColumn<QString>("file");
+    QTest::addColumn<QString>("warning");
+
+    const QString missing = sDataDir + QStringLiteral("/does-not-exist.xml");
+    QTest::newRow("missing file")
+        << missing << QStringLiteral("ZuStyle: couldn't open file '%1'\n").arg(missing);
+    QTest::newRow("directory")
+        << sDataDir << QStringLiteral("ZuStyle: couldn't open file '%1'\n").arg(sDataDir);
+    QTest::newRow("invalid xml")
+        << dataFile("invalid.xml")
+        << QStringLiteral("ZuStyle: '%1' is no valid xml - document : tag mismatch in line 4\n")
+               .arg(dataFile("invalid.xml"));
+    QTest::newRow("empty file") << dataFile("empty.xml")
+                                << QStringLiteral("ZuStyle: '%1' is no valid xml - document : "
+                                                  "unexpected end of file in line 1\n")
+                                       .arg(dataFile("empty.xml"));
+    // The version is tested before the root's name.
+    QTest::newRow("no version") << dataFile("missing_version.xml")
+                                << QStringLiteral("ZuStyle: version < 0.000000 is not supported\n");
+    QTest::newRow("old version, wrong root")
+        << dataFile("old_palette.xml")
+        << QStringLiteral("ZuStyle: version < 0.900000 is not supported\n");
+    QTest::newRow("wrong root") << dataFile("wrong_root.xml")
+                                << QStringLiteral("ZuStyle: document is no color scheme\n");
+}
+
+void tst_StyleFactory::rejectedFiles()
+{
+    QFETCH(QString, file);
+    QFETCH(QString, warning);
+    ZuStyleFactory& factory = ZuStyleFactory::instance();
+    const QStringList namesBefore = factory.styleNames();
+
+    RkLogCapture capture;
+    QVERIFY(!factory.addStyle(file));
+    QCOMPARE(warnings(capture), QStringList{warning});
+    QCOMPARE(int(capture.entries().size()), 1);
+    QCOMPARE(factory.styleNames(), namesBefore);
+}
+
+void tst_StyleFactory::fullScheme()
+{
+    const QPalette start = QGuiApplication::palette();
+    RkLogCapture capture;
+    QVERIFY(ZuStyleFactory::instance().addStyle(dataFile("full.xml")));
+    QVERIFY(capture.entries().empty());
+
+    const ZuColorScheme* full = scheme(QStringLiteral("Full"));
+    QVERIFY(full);
+    QCOMPARE(full->styleClass, QStringLiteral("ZuStyle"));
+    QCOMPARE(full->translateName, true);
+    QCOMPARE(full->priority, 7);
+
+    const QPalette& p = full->palette;
+    // The later entry of the first Active element wins; "window" and the second Active do not.
+    QCOMPARE(rgb(p.color(QPalette::Active, QPalette::Window)), QStringLiteral("10,20,30,255"));
+    QCOMPARE(rgb(p.color(QPalette::Active, QPalette::Base)), QStringLiteral("250,251,252,255"));
+    QCOMPARE(rgb(p.color(QPalette::Active, QPalette::Text)), QStringLiteral("5,6,0,255"));
+    QCOMPARE(p.brush(QPalette::Active, QPalette::Window).style(), Qt::SolidPattern);
+    QCOMPARE(rgb(p.color(QPalette::Disabled, QPalette::Text)), QStringLiteral("128,129,130,255"));
+    // Roles the file does not set keep the application's colours of the moment.
+    QCOMPARE(p.color(QPalette::Active, QPalette::Button),
+             start.color(QPalette::Active, QPalette::Button));
+    QCOMPARE(p.color(QPalette::Disabled, QPalette::Window),
+             start.color(QPalette::Disabled, QPalette::Window));
+    QCOMPARE(p.color(QPalette::Active, QPalette::ToolTipBase),
+             start.color(QPalette::Active, QPalette::ToolTipBase));
+    // No Inactive element: Inactive copies Active in every file role.
+    for (QPalette::ColorRole role : sFileRoles)
+        QCOMPARE(p.color(QPalette::Inactive, role), p.color(QPalette::Active, role));
+
+    // First entry per id wins; only the first UserDefined element counts.
+    QCOMPARE(full->userDefinedColors.keys(),
+             (QStringList{QStringLiteral("PanelBackground"), QStringLiteral("PanelText")}));
+    QCOMPARE(rgb(full->userDefinedColors.value(QStringLiteral("PanelBackground"))),
+             QStringLiteral("11,22,33,255"));
+}
+
+void tst_StyleFactory::emptyInactiveKeepsStartingColours()
+{
+    const QPalette start = QGuiApplication::palette();
+    QVERIFY(ZuStyleFactory::instance().addStyle(dataFile("empty_inactive.xml")));
+    const ZuColorScheme* empty = scheme(QStringLiteral("EmptyInactive"));
+    QVERIFY(empty);
+    QCOMPARE(rgb(empty->palette.color(QPalette::Active, QPalette::Window)),
+             QStringLiteral("10,20,30,255"));
+    QCOMPARE(empty->palette.color(QPalette::Inactive, QPalette::Window),
+             start.color(QPalette::Inactive, QPalette::Window));
+    QCOMPARE(empty->palette.color(QPalette::Inactive, QPalette::Base),
+             start.color(QPalette::Inactive, QPalette::Base));
+    QCOMPARE(empty->translateName, false); // "TRUE" is not one of the accepted spellings
+    QCOMPARE(empty->priority, 0);          // "high" is no number
+}
+
+void tst_StyleFactory::translateName_data()
+{
+    QTest::addColumn<QString>("value");
+    QTest::addColumn<bool>("flag");
+    QTest::newRow("on") << "on" << true;
+    QTest::newRow("true") << "true" << true;
+    QTest::newRow("1") << "1" << true;
+    QTest::newRow("On") << "On" << false;
+    QTest::newRow("True") << "True" << false;
+    QTest::newRow("yes") << "yes" << false;
+    QTest::newRow("0") << "0" << false;
+    QTest::newRow("empty") << "" << false;
+}
+
+void tst_StyleFactory::translateName()
+{
+    QFETCH(QString, value);
+    QFETCH(bool, flag);
+    const QString name = QStringLiteral("Translate-") + QTest::currentDataTag();
+    const QString file =
+        writeFile(mTemp, name + QStringLiteral(".scheme"),
+                  QStringLiteral("<ColorScheme Version=\"1\" Name=\"%1\" TranslateName=\"%2\"/>")
+                      .arg(name, value));
+    QVERIFY(ZuStyleFactory::instance().addStyle(file));
+    QVERIFY(scheme(name));
+    QCOMPARE(scheme(name)->translateName, flag);
+}
+
+void tst_StyleFactory::nativeClass()
+{
+    ZuStyleFactory& factory = ZuStyleFactory::instance();
+    QVERIFY(factory.addStyle(dataFile("native_upper.xml")));
+    QCOMPARE(scheme(QStringLiteral("NativeUpper"))->styleClass, mNativeClass);
+
+    const std::unique_ptr<QStyle> fromFile(
+        factory.createStyleFromName(QStringLiteral("NativeUpper")));
+    const std::unique_ptr<QStyle> fromClass(factory.createStyleFromClass(QStringLiteral("native")));
+    const std::unique_ptr<QStyle> platform(QStyleFactory::create(mNativeClass));
+    QVERIFY(fromFile && fromClass && platform);
+    QCOMPARE(fromFile->metaObject()->className(), platform->metaObject()->className());
+    QCOMPARE(fromClass->metaObject()->className(), platform->metaObject()->className());
+    QVERIFY(!dynamic_cast<ZuStyle*>(fromClass.get()));
+
+    const std::unique_ptr<QStyle> own(factory.createStyleFromClass(QStringLiteral("zuSTYLE")));
+    QVERIFY(dynamic_cast<ZuStyle*>(own.get()));
+    QVERIFY(!factory.createStyleFromClass(QStringLiteral("NoSuchStyle")));
+    QVERIFY(!factory.createStyleFromName(QStringLiteral("No such scheme")));
+}
+
+void tst_StyleFactory::sameNameReplacesWholeScheme()
+{
+    ZuStyleFactory& factory = ZuStyleFactory::instance();
+    const unsigned int before = factory.count();
+    QVERIFY(factory.addStyle(dataFile("duplicate_first.xml")));
+    QVERIFY(scheme(QStringLiteral("Duplicate"))->userDefinedColors.contains("OnlyInFirst"));
+    QVERIFY(factory.addStyle(dataFile("duplicate_second.xml")));
+    QCOMPARE(factory.count(), before + 1);
+    const ZuColorScheme* duplicate = scheme(QStringLiteral("Duplicate"));
+    QCOMPARE(rgb(duplicate->palette.color(QPalette::Active, QPalette::Window)),
+             QStringLiteral("0,100,0,255"));
+    QVERIFY(duplicate->userDefinedColors.isEmpty());
+}
+
+void tst_StyleFactory::addStylesFromPath()
+{
+    ZuStyleFactory& factory = ZuStyleFactory::instance();
+    QTemporaryDir dir;
+    QVERIFY(dir.isValid());
+    writeFile(dir, QStringLiteral("b.xml"), schemeText("bScheme", Qt::white, Qt::red));
+    writeFile(dir, QStringLiteral("UPPER.XML"), schemeText("Upper", Qt::white, Qt::red));
+    writeFile(dir, QStringLiteral("notes.txt"), schemeText("Ignored", Qt::white, Qt::red));
+    writeFile(dir, QStringLiteral("broken.xml"), QStringLiteral("<ColorScheme"));
+    QVERIFY(QDir(dir.path()).mkdir(QStringLiteral("folder.xml")));
+
+    RkLogCapture capture;
+    QCOMPARE(factory.addStylesFromPath(dir.path()), 2);
+    QCOMPARE(warnings(capture).size(), 1); // the broken file only
+    const QStringList names = factory.styleNames();
+    QVERIFY(names.contains(QStringLiteral("Upper")) && names.contains(QStringLiteral("bScheme")));
+    QVERIFY(!names.contains(QStringLiteral("Ignored")));
+    // Ordered by UTF-16 code units: upper case before lower case.
+    QVERIFY(names.indexOf(QStringLiteral("Upper")) < names.indexOf(QStringLiteral("bScheme")));
+    QVERIFY(std::is_sorted(names.begin(), names.end()));
+
+    QCOMPARE(factory.addStylesFromPath(dir.filePath(QStringLiteral("nowhere"))), 0);
+}
+
+void tst_StyleFactory::setCurrentStyleSignalsOnce()
+{
+    ZuStyleFactory& factory = ZuStyleFactory::instance();
+    QVERIFY(factory.addStyle(dataFile("unknown_class.xml")));
+    const QPalette expected = scheme(QStringLiteral("Full"))->palette;
+
+    QSignalSpy spy(&factory, &ZuStyleFactory::paletteChanged);
+    QString windowAtSignal;
+    bool zuStyleAtSignal = false;
+    const QMetaObject::Connection connection =
+        connect(&factory, &ZuStyleFactory::paletteChanged, this, [&] {
+            windowAtSignal = rgb(QGuiApplication::palette().color(QPalette::Window));
+            zuStyleAtSignal = dynamic_cast<ZuStyle*>(QApplication::style()) != nullptr;
+        });
+
+    factory.setCurrentStyle(QStringLiteral("Full"));
+    QCOMPARE(spy.count(), 1);
+    QCOMPARE(factory.currentStyle(), QStringLiteral("Full"));
+    // Palette and style are both in place when the signal goes out.
+    QCOMPARE(windowAtSignal, QStringLiteral("10,20,30,255"));
+    QVERIFY(zuStyleAtSignal);
+    QCOMPARE(QGuiApplication::palette(), expected);
+    QCOMPARE(factory.standardPalette(), expected);
+
+    factory.setCurrentStyle(QStringLiteral("Full"));
+    factory.setCurrentStyle(QStringLiteral("No such scheme"));
+    factory.setCurrentStyle(QStringLiteral("UnknownClass"));
+    QCOMPARE(spy.count(), 1);
+    QCOMPARE(factory.currentStyle(), QStringLiteral("Full"));
+    QVERIFY(dynamic_cast<ZuStyle*>(QApplication::style()));
+    disconnect(connection);
+
+    QCOMPARE(rgb(factory.userDefinedColor(QStringLiteral("PanelBackground"), Qt::red)),
+             QStringLiteral("11,22,33,255"));
+    QCOMPARE(factory.userDefinedColor(QStringLiteral("panelbackground"), Qt::red), QColor(Qt::red));
+    QCOMPARE(factory.userDefinedColor(QString(), Qt::blue), QColor(Qt::blue));
+}
+
+void tst_StyleFactory::paletteStartsFromCurrentScheme()
+{
+    // Read after switching: roles the file leaves out come from the scheme in force.
+    const QString file =
+        writeFile(mTemp, QStringLiteral("later.xml"),
+                  QStringLiteral("<ColorScheme Version=\"1.0\" Name=\"Later\"><Active>"
+                                 "<Color Id=\"Base\" Red=\"1\" Green=\"1\" Blue=\"1\"/>"
+                                 "</Active></ColorScheme>"));
+    QVERIFY(ZuStyleFactory::instance().addStyle(file));
+    const QPalette& later = scheme(QStringLiteral("Later"))->palette;
+    QCOMPARE(rgb(later.color(QPalette::Active, QPalette::Window)), QStringLiteral("10,20,30,255"));
+    QCOMPARE(rgb(later.color(QPalette::Active, QPalette::Base)), QStringLiteral("1,1,1,255"));
+}
+
+void tst_StyleFactory::tesselNative_data()
+{
+    QTest::addColumn<QColor>("midlight");
+    QTest::addColumn<bool>("tessel");
+    QTest::newRow("201 grey") << QColor(201, 201, 201) << true;
+    QTest::newRow("200 grey") << QColor(200, 200, 200) << false;
+    QTest::newRow("white") << QColor(255, 255, 255) << true;
+    QTest::newRow("cyan") << QColor(0, 255, 255) << false;          // (16+5)*255 >> 5 = 167
+    QTest::newRow("light yellow") << QColor(255, 255, 120) << true; // (27*255+600) >> 5 = 233
+    QTest::newRow("black") << QColor(0, 0, 0) << false;
+}
+
+void tst_StyleFactory::tesselNative()
+{
+    QFETCH(QColor, midlight);
+    QFETCH(bool, tessel);
+    ZuStyleFactory& factory = ZuStyleFactory::instance();
+    const QString name = QStringLiteral("Midlight ") + QTest::currentDataTag();
+    QVERIFY(factory.addStyle(
+        writeFile(mTemp, name + QStringLiteral(".xml"), schemeText(name, midlight, Qt::red))));
+    factory.setCurrentStyle(name);
+    QCOMPARE(factory.currentStyle(), name);
+    QCOMPARE(factory.currentStyleIsTesselNative(), tessel);
+    QVERIFY(!factory.currentStyleIsOSNative());
+}
+
+void tst_StyleFactory::osNative()
+{
+    ZuStyleFactory& factory = ZuStyleFactory::instance();
+    factory.setCurrentStyle(QStringLiteral("NativeUpper"));
+    QCOMPARE(factory.currentStyle(), QStringLiteral("NativeUpper"));
+    QVERIFY(factory.currentStyleIsOSNative());
+    QVERIFY(!factory.showToolCardChooserButton());
+    QVERIFY(!dynamic_cast<ZuStyle*>(QApplication::style()));
+
+    factory.setCurrentStyle(QStringLiteral("Full"));
+    QVERIFY(!factory.currentStyleIsOSNative());
+    QVERIFY(factory.showToolCardChooserButton());
+}
+
+void tst_StyleFactory::styleForWidgetTree()
+{
+    ZuStyleFactory& factory = ZuStyleFactory::instance();
+    QWidget top;
+    auto* child = new QWidget(&top);
+    auto* grandChild = new QWidget(child);
+    const QList<QWidget*> tree = {&top, child, grandChild};
+    QStyle* before = top.style();
+
+    QVERIFY(!factory.setStyleForWidget(QStringLiteral("No such scheme"), &top));
+    QVERIFY(!factory.setStyleForWidget(QStringLiteral("UnknownClass"), &top));
+    for (QWidget* widget : tree)
+        QCOMPARE(widget->style(), before);
+
+    QVERIFY(factory.setStyleForWidget(QStringLiteral("Duplicate"), &top));
+    QStyle* schemeStyle = top.style();
+    QVERIFY(dynamic_cast<ZuStyle*>(schemeStyle));
+    for (QWidget* widget : tree) {
+        QCOMPARE(widget->style(), schemeStyle);
+        QCOMPARE(rgb(widget->palette().color(QPalette::Active, QPalette::Window)),
+                 QStringLiteral("0,100,0,255"));
+        QCOMPARE(
+            widget->palette().color(QPalette::Active, QPalette::Base),
+            scheme(QStringLiteral("Duplicate"))->palette.color(QPalette::Active, QPalette::Base));
+    }
+
+    QVERIFY(factory.setNativeStyleForWidget(&top));
+    const std::unique_ptr<QStyle> platform(QStyleFactory::create(mNativeClass));
+    for (QWidget* widget : tree) {
+        QCOMPARE(widget->style(), top.style());
+        QCOMPARE(widget->style()->metaObject()->className(), platform->metaObject()->className());
+        QCOMPARE(widget->palette().color(QPalette::Active, QPalette::Window),
+                 mNativePalette.color(QPalette::Active, QPalette::Window));
+    }
+}
+
+void tst_StyleFactory::themeChangeRestoresSchemePalette()
+{
+    ZuStyleFactory& factory = ZuStyleFactory::instance();
+    factory.setCurrentStyle(QStringLiteral("Full"));
+    QPalette other = factory.standardPalette();
+    other.setColor(QPalette::Window, Qt::yellow);
+    QApplication::setPalette(other);
+
+    ThemeChangeObserver observer;
+    QObject receiver;
+    QEvent unrelated(QEvent::PaletteChange);
+    observer.beforeNotify(&receiver, &unrelated);
+    QEvent themeChange(QEvent::ThemeChange);
+    observer.afterNotify(&receiver, &themeChange);
+    QCOMPARE(QGuiApplication::palette().color(QPalette::Window), QColor(Qt::yellow));
+
+    observer.beforeNotify(nullptr, &themeChange);
+    QCOMPARE(QGuiApplication::palette(), factory.standardPalette());
+}
+
+void tst_StyleFactory::styledWidgetColours_data()
+{
+    QTest::addColumn<QByteArray>("foregroundName");
+    QTest::addColumn<QByteArray>("backgroundName");
+    QTest::addColumn<QColor>("foregroundDefault");
+    QTest::addColumn<QColor>("backgroundDefault");
+    QTest::addColumn<QString>("foreground");
+    QTest::addColumn<QString>("background");
+
+    const QString text = QStringLiteral("5,6,0,255");       // the scheme's Text
+    const QString base = QStringLiteral("250,251,252,255"); // the scheme's Base
+    QTest::newRow("nothing set") << QByteArray() << QByteArray() << QColor() << QColor() << text
+                                 << base;
+    QTest::newRow("names defined")
+        << QByteArray("PanelText") << QByteArray("PanelBackground") << QColor(Qt::red)
+        << QColor(Qt::blue) << QStringLiteral("240,230,220,255") << QStringLiteral("11,22,33,255");
+    QTest::newRow("unknown names, defaults")
+        << QByteArray("NoText") << QByteArray("NoBack") << QColor(Qt::red) << QColor(Qt::blue)
+        << QStringLiteral("255,0,0,255") << QStringLiteral("0,0,255,255");
+    QTest::newRow("unknown names, no defaults")
+        << QByteArray("NoText") << QByteArray("NoBack") << QColor() << QColor() << text << base;
+}
+
+void tst_StyleFactory::styledWidgetColours()
+{
+    QFETCH(QByteArray, foregroundName);
+    QFETCH(QByteArray, backgroundName);
+    QFETCH(QColor, foregroundDefault);
+    QFETCH(QColor, backgroundDefault);
+    QFETCH(QString, foreground);
+    QFETCH(QString, background);
+    ZuStyleFactory::instance().setCurrentStyle(QStringLiteral("Full"));
+
+    QWidget widget;
+    ZuStyledWidget styled(&widget);
+    if (!foregroundName.isEmpty())
+        styled.setForegroundColorName(foregroundName.constData());
+    if (!backgroundName.isEmpty())
+        styled.setBackgroundColorName(backgroundName.constData());
+    styled.setForegroundColorDefault(foregroundDefault);
+    styled.setBackgroundColorDefault(backgroundDefault);
+
+    for (QPalette::ColorGroup group : {QPalette::Active, QPalette::Inactive, QPalette::Disabled}) {
+        QCOMPARE(rgb(widget.palette().color(group, QPalette::Text)), foreground);
+        QCOMPARE(rgb(widget.palette().color(group, QPalette::WindowText)), foreground);
+        QCOMPARE(rgb(widget.palette().color(group, QPalette::Base)), background);
+    }
+    // Everything else is the scheme's.
+    QCOMPARE(widget.palette().color(QPalette::Window),
+             ZuStyleFactory::instance().standardPalette().color(QPalette::Window));
+}
+
+void tst_StyleFactory::styledWidgetFollowsSchemeSwitch()
+{
+    ZuStyleFactory& factory = ZuStyleFactory::instance();
+    QVERIFY(factory.addStyle(writeFile(mTemp, QStringLiteral("red.xml"),
+                                       schemeText("RedPanel", Qt::white, QColor(200, 0, 0)))));
+    QVERIFY(factory.addStyle(writeFile(mTemp, QStringLiteral("green.xml"),
+                                       schemeText("GreenPanel", Qt::white, QColor(0, 200, 0)))));
+    factory.setCurrentStyle(QStringLiteral("RedPanel"));
+
+    QWidget kept;
+    auto styledKept = std::make_unique<ZuStyledWidget>(&kept);
+    styledKept->setBackgroundColorName("Panel");
+    auto* doomed = new QWidget;
+    QPointer<QWidget> guard(doomed);
+    ZuStyledWidget styledDoomed(doomed);
+    styledDoomed.setBackgroundColorName("Panel");
+    QCOMPARE(rgb(kept.palette().color(QPalette::Base)), QStringLiteral("200,0,0,255"));
+
+    delete doomed; // the handle outlives its widget
+    QVERIFY(guard.isNull());
+    factory.setCurrentStyle(QStringLiteral("GreenPanel"));
+    QCOMPARE(rgb(kept.palette().color(QPalette::Base)), QStringLiteral("0,200,0,255"));
+
+    // A destroyed handle no longer touches its widget.
+    styledKept.reset();
+    factory.setCurrentStyle(QStringLiteral("RedPanel"));
+    QCOMPARE(rgb(kept.palette().color(QPalette::Base)), QStringLiteral("0,200,0,255"));
+}
+
+QTEST_MAIN(tst_StyleFactory)
+#include "tst_stylefactory.moc"
