@@ -13,7 +13,10 @@ QStringList sEvents; // what the test commands saw, in order
 class TestCommand : public ZuBase::Command
 {
 public:
-    explicit TestCommand(const char* inName) : mName(inName) { sEvents << QStringLiteral("create %1").arg(mName); }
+    explicit TestCommand(const char* inName) : mName(inName)
+    {
+        sEvents << QStringLiteral("create %1").arg(mName);
+    }
     RkResult execute() override { return RkResult(); }
     const char* description() const override { return mDescription; }
     const char* detailedDescription() const override { return "    x=VALUE   an attribute\n"; }
@@ -33,8 +36,14 @@ public:
     const char* mDescription = "Test command.";
 };
 
-RkHandle<ZuBase::Command> makeA() { return new TestCommand("A"); }
-RkHandle<ZuBase::Command> makeB() { return new TestCommand("B"); }
+RkHandle<ZuBase::Command> makeA()
+{
+    return new TestCommand("A");
+}
+RkHandle<ZuBase::Command> makeB()
+{
+    return new TestCommand("B");
+}
 RkHandle<ZuBase::Command> makeHelp()
 {
     auto* command = new TestCommand("help");
@@ -122,18 +131,18 @@ void TestCommandLine::parse_data()
                                   << "A(x=1) B(y=2)" << QStringList();
     QTest::newRow("repeats kept in order")
         << QStringList{"--A", "x=1", "x=2", "--A"} << true << "A(x=1,x=2) A()" << QStringList();
-    QTest::newRow("inner quotes kept") << QStringList{"--A", "x=\"p q\""} << true
-                                       << "A(x=\"p q\")" << QStringList();
-    QTest::newRow("outer quotes dropped") << QStringList{"--A", "\"x=p q\""} << true
-                                          << "A(x=p q)" << QStringList();
-    QTest::newRow("escaped quotes") << QStringList{"--A", "\"a=\\\"b\\\"\""} << true
-                                    << "A(a=\"b\")" << QStringList();
+    QTest::newRow("inner quotes kept")
+        << QStringList{"--A", "x=\"p q\""} << true << "A(x=\"p q\")" << QStringList();
+    QTest::newRow("outer quotes dropped")
+        << QStringList{"--A", "\"x=p q\""} << true << "A(x=p q)" << QStringList();
+    QTest::newRow("escaped quotes")
+        << QStringList{"--A", "\"a=\\\"b\\\"\""} << true << "A(a=\"b\")" << QStringList();
     QTest::newRow("trimmed") << QStringList{"  --A ", "\tx=1 "} << true << "A(x=1)"
                              << QStringList();
     QTest::newRow("empty value") << QStringList{"--A", "name="} << true << "A(name=)"
                                  << QStringList();
-    QTest::newRow("value with equal signs") << QStringList{"--A", "a=b=c"} << true << "A(a=b=c)"
-                                            << QStringList();
+    QTest::newRow("value with equal signs")
+        << QStringList{"--A", "a=b=c"} << true << "A(a=b=c)" << QStringList();
     QTest::newRow("single quote char") << QStringList{"--A", "\""} << false << ""
                                        << QStringList{sWhere + "parseCommands: parse error near "
                                                                "'\"'  cond[posOfEqualSign>0]"};
@@ -209,19 +218,24 @@ void TestCommandLine::attribute1_data()
     QTest::addColumn<QString>("handedOut");
     QTest::addColumn<QString>("failure");
 
-    QTest::newRow("once, exactly") << QStringList{"k=1"} << true << true << "1" << "";
+    QTest::newRow("once, exactly") << QStringList{"k=1"} << true << true << "1"
+                                   << "";
     QTest::newRow("missing, exactly")
         << QStringList{"other=1"} << true << false << ""
         << sWhere + "attribute1: The attribute 'k' must occur exactly once.  val[0]  exp[1]";
     QTest::newRow("twice, exactly")
         << QStringList{"k=1", "k=2"} << true << false << "1"
         << sWhere + "attribute1: The attribute 'k' must occur exactly once.  val[2]  exp[1]";
-    QTest::newRow("missing, optional") << QStringList{} << false << true << "" << "";
-    QTest::newRow("once, optional") << QStringList{"k=v"} << false << true << "v" << "";
+    QTest::newRow("missing, optional") << QStringList{} << false << true << ""
+                                       << "";
+    QTest::newRow("once, optional") << QStringList{"k=v"} << false << true << "v"
+                                    << "";
     QTest::newRow("twice, optional")
         << QStringList{"k=first", "k=second"} << false << false << "first"
-        << sWhere + "attribute1: The attribute 'k' must not occur more than once.  cond[arr.size()<2]";
-    QTest::newRow("case sensitive name") << QStringList{"K=1"} << false << true << "" << "";
+        << sWhere +
+               "attribute1: The attribute 'k' must not occur more than once.  cond[arr.size()<2]";
+    QTest::newRow("case sensitive name") << QStringList{"K=1"} << false << true << ""
+                                         << "";
 }
 
 void TestCommandLine::attribute1()

@@ -14,8 +14,8 @@
 #include <QtTest>
 
 #include <atomic>
-#include <set>
 #include <cerrno>
+#include <set>
 #include <thread>
 
 namespace {
@@ -30,7 +30,10 @@ struct Counted : RkHandable
 namespace Family {
 struct Widget
 {
-    static RkResult check(int inValue) { return RK_CHECK(inValue > 0, "inValue>0", "Internal Error"); }
+    static RkResult check(int inValue)
+    {
+        return RK_CHECK(inValue > 0, "inValue>0", "Internal Error");
+    }
     static RkResult equal(int inValue) { return RK_CHECK_EQ(inValue, 1, QStringLiteral("count")); }
     static RkResult differ(const QString& inValue)
     {
@@ -97,12 +100,18 @@ void TestRkLib::checkRecords_data()
     QTest::addColumn<bool>("bad");
     QTest::addColumn<QString>("message");
     QTest::addColumn<QString>("detail");
-    QTest::newRow("cond holds") << 0 << false << "" << "";
-    QTest::newRow("cond fails") << 1 << true << "Internal Error" << "cond[inValue>0]";
-    QTest::newRow("eq holds") << 2 << false << "" << "";
-    QTest::newRow("eq fails") << 3 << true << "count" << "val[7]  exp[1]";
-    QTest::newRow("ne holds") << 4 << false << "" << "";
-    QTest::newRow("ne fails") << 5 << true << "must not be x" << "val[x]  notexp[x]";
+    QTest::newRow("cond holds") << 0 << false << ""
+                                << "";
+    QTest::newRow("cond fails") << 1 << true << "Internal Error"
+                                << "cond[inValue>0]";
+    QTest::newRow("eq holds") << 2 << false << ""
+                              << "";
+    QTest::newRow("eq fails") << 3 << true << "count"
+                              << "val[7]  exp[1]";
+    QTest::newRow("ne holds") << 4 << false << ""
+                              << "";
+    QTest::newRow("ne fails") << 5 << true << "must not be x"
+                              << "val[x]  notexp[x]";
 }
 
 void TestRkLib::checkRecords()
@@ -113,12 +122,24 @@ void TestRkLib::checkRecords()
     QFETCH(QString, detail);
     RkResult res;
     switch (which) {
-    case 0: res = Family::Widget::check(3); break;
-    case 1: res = Family::Widget::check(-3); break;
-    case 2: res = Family::Widget::equal(1); break;
-    case 3: res = Family::Widget::equal(7); break;
-    case 4: res = Family::Widget::differ("y"); break;
-    case 5: res = Family::Widget::differ("x"); break;
+    case 0:
+        res = Family::Widget::check(3);
+        break;
+    case 1:
+        res = Family::Widget::check(-3);
+        break;
+    case 2:
+        res = Family::Widget::equal(1);
+        break;
+    case 3:
+        res = Family::Widget::equal(7);
+        break;
+    case 4:
+        res = Family::Widget::differ("y");
+        break;
+    case 5:
+        res = Family::Widget::differ("x");
+        break;
     }
     QCOMPARE(res.isBad(), bad);
     QCOMPARE(res.isOk(), !bad);
@@ -132,10 +153,10 @@ void TestRkLib::checkRecords()
     QCOMPARE(QString::fromStdString(record.message), message);
     QCOMPARE(QString::fromStdString(record.detail), detail);
     QVERIFY2(QString::fromStdString(record.where).startsWith("tst_rklib:"), record.where.c_str());
-    QVERIFY2(QString::fromStdString(record.where).endsWith("Family::Widget::" +
-                                                            QString(which == 1   ? "check"
-                                                                    : which == 3 ? "equal"
-                                                                                 : "differ")),
+    QVERIFY2(QString::fromStdString(record.where)
+                 .endsWith("Family::Widget::" + QString(which == 1   ? "check"
+                                                        : which == 3 ? "equal"
+                                                                     : "differ")),
              record.where.c_str());
     QVERIFY(record.line > 0);
 }
@@ -187,14 +208,16 @@ void TestRkLib::qualifiedFunctionName_data()
         << "ZuBase::Command::create";
     QTest::newRow("free function") << "RkResult ZuBase::File::readAll(const QString&, QByteArray&)"
                                    << "ZuBase::File::readAll";
-    QTest::newRow("template return")
-        << "QMap<QString, int> Zu::Foo::bar(int)" << "Zu::Foo::bar";
-    QTest::newRow("constructor") << "ZuBase::Pipe::Pipe(const QString&)" << "ZuBase::Pipe::Pipe";
+    QTest::newRow("template return") << "QMap<QString, int> Zu::Foo::bar(int)"
+                                     << "Zu::Foo::bar";
+    QTest::newRow("constructor") << "ZuBase::Pipe::Pipe(const QString&)"
+                                 << "ZuBase::Pipe::Pipe";
     QTest::newRow("operator call") << "bool Zu::Less::operator()(int) const"
                                    << "Zu::Less::operator()";
     QTest::newRow("lambda inside") << "ZuBase::Process::start(bool)::<lambda()>"
                                    << "ZuBase::Process::start";
-    QTest::newRow("pointer return") << "const char* ZuX::name() const" << "ZuX::name";
+    QTest::newRow("pointer return") << "const char* ZuX::name() const"
+                                    << "ZuX::name";
 }
 
 void TestRkLib::qualifiedFunctionName()
@@ -214,8 +237,8 @@ void TestRkLib::failReportsEachRecord()
     QVERIFY(!Tz::fail(RkResult()));
     QVERIFY(capture.entries().empty());
 
-    RkResult res(RkResult::Error, 12, "src/core/zubase/File:ZuBase::File::readAll", "Internal Error",
-                 "cond[file.exists()]");
+    RkResult res(RkResult::Error, 12, "src/core/zubase/File:ZuBase::File::readAll",
+                 "Internal Error", "cond[file.exists()]");
     res << RkResult(RkResult::Error, 13, "w", "m", "d");
     QVERIFY(Tz::fail(res));
     const auto entries = capture.entries();
@@ -261,11 +284,10 @@ void TestRkLib::writeCallbackLevelsAndDisabler()
     log.errorf("after scope");
     log.setWriteCallback(nullptr, RkLogOff);
     log.errorf("removed");
-    const std::vector<std::pair<RkLogLevel, std::string>> expected = {
-        {RkLogWarning, "warn x"},
-        {RkLogError, "other thread"},
-        {RkLogError, "shown"},
-        {RkLogError, "after scope"}};
+    const std::vector<std::pair<RkLogLevel, std::string>> expected = {{RkLogWarning, "warn x"},
+                                                                      {RkLogError, "other thread"},
+                                                                      {RkLogError, "shown"},
+                                                                      {RkLogError, "after scope"}};
     QCOMPARE(sCallbackLines, expected);
 }
 
@@ -376,10 +398,22 @@ void TestRkLib::stringHelpers_data()
     QTest::addColumn<QString>("from");
     QTest::addColumn<QString>("to");
     QTest::addColumn<QString>("replaced");
-    QTest::newRow("several") << "a.b.c" << "." << "::" << "a::b::c";
-    QTest::newRow("not rescanned") << "aa" << "a" << "aa" << "aaaa";
-    QTest::newRow("none") << "abc" << "x" << "y" << "abc";
-    QTest::newRow("empty needle") << "abc" << "" << "y" << "abc";
+    QTest::newRow("several") << "a.b.c"
+                             << "."
+                             << "::"
+                             << "a::b::c";
+    QTest::newRow("not rescanned") << "aa"
+                                   << "a"
+                                   << "aa"
+                                   << "aaaa";
+    QTest::newRow("none") << "abc"
+                          << "x"
+                          << "y"
+                          << "abc";
+    QTest::newRow("empty needle") << "abc"
+                                  << ""
+                                  << "y"
+                                  << "abc";
 }
 
 void TestRkLib::stringHelpers()
@@ -419,12 +453,18 @@ void TestRkLib::versionOrdering_data()
     QTest::addColumn<QString>("left");
     QTest::addColumn<QString>("right");
     QTest::addColumn<int>("order");
-    QTest::newRow("numeric not text") << "1.10" << "1.9" << 1;
-    QTest::newRow("equal with zero") << "1.2" << "1.2.0" << 0;
-    QTest::newRow("patch") << "7.4.12" << "7.4.2" << 1;
-    QTest::newRow("major wins") << "2.0" << "10.0" << -1;
-    QTest::newRow("suffix ignored") << "3.1beta" << "3.1" << 0;
-    QTest::newRow("empty") << "" << "0" << 0;
+    QTest::newRow("numeric not text") << "1.10"
+                                      << "1.9" << 1;
+    QTest::newRow("equal with zero") << "1.2"
+                                     << "1.2.0" << 0;
+    QTest::newRow("patch") << "7.4.12"
+                           << "7.4.2" << 1;
+    QTest::newRow("major wins") << "2.0"
+                                << "10.0" << -1;
+    QTest::newRow("suffix ignored") << "3.1beta"
+                                    << "3.1" << 0;
+    QTest::newRow("empty") << ""
+                           << "0" << 0;
 }
 
 void TestRkLib::versionOrdering()
@@ -436,7 +476,7 @@ void TestRkLib::versionOrdering()
     const RkVersion r(right.toStdString());
     QCOMPARE(l < r, order < 0);
     QCOMPARE(l == r, order == 0);
-    QCOMPARE(r < l, order > 0);
+    QCOMPARE(r<l, order> 0);
     QCOMPARE(RkVersion("7.4.12").majorVersion(), 7);
     QCOMPARE(RkVersion("7.4.12").minorVersion(), 4);
 }
@@ -446,12 +486,18 @@ void TestRkLib::filenameHelpers_data()
     QTest::addColumn<QString>("path");
     QTest::addColumn<QString>("dirname");
     QTest::addColumn<bool>("relative");
-    QTest::newRow("absolute") << "/a/b/c.txt" << "/a/b" << false;
-    QTest::newRow("relative") << "a/b" << "a" << true;
-    QTest::newRow("bare") << "file" << "." << true;
-    QTest::newRow("root child") << "/x" << "/" << false;
-    QTest::newRow("trailing slash") << "/a/b/" << "/a" << false;
-    QTest::newRow("windows") << "C:\\data\\x.ini" << "C:\\data" << false;
+    QTest::newRow("absolute") << "/a/b/c.txt"
+                              << "/a/b" << false;
+    QTest::newRow("relative") << "a/b"
+                              << "a" << true;
+    QTest::newRow("bare") << "file"
+                          << "." << true;
+    QTest::newRow("root child") << "/x"
+                                << "/" << false;
+    QTest::newRow("trailing slash") << "/a/b/"
+                                    << "/a" << false;
+    QTest::newRow("windows") << "C:\\data\\x.ini"
+                             << "C:\\data" << false;
 }
 
 void TestRkLib::filenameHelpers()

@@ -18,8 +18,7 @@ bool hasDisplay()
            !qEnvironmentVariableIsEmpty("WAYLAND_DISPLAY");
 }
 
-template <typename T>
-bool hasCommand(const RkDArray<RkHandle<ZuBase::Command>>& inCommands)
+template <typename T> bool hasCommand(const RkDArray<RkHandle<ZuBase::Command>>& inCommands)
 {
     for (const auto& command : inCommands) {
         if (dynamic_cast<T*>(command.get()))
@@ -68,8 +67,8 @@ int main(int argc, char** argv)
             std::fprintf(stderr, "zudemo: could not write %s\n", qPrintable(screenshot));
             return 1;
         }
-        std::printf("zudemo: %swrote the main window to %s\n",
-                    headless ? "no display; " : "", qPrintable(QDir::toNativeSeparators(screenshot)));
+        std::printf("zudemo: %swrote the main window to %s\n", headless ? "no display; " : "",
+                    qPrintable(QDir::toNativeSeparators(screenshot)));
         return 0;
     }
 

@@ -25,8 +25,7 @@ class RKLIB_EXPORT DvParameter : public DvParamBase
 public:
     DvParameter(const RkString& inName, const RkString& inValue)
         : DvParamBase(inName), mValue(inValue)
-    {
-    }
+    {}
 
     const RkString& getString() const { return mValue; }
     void setString(const RkString& inValue) { mValue = inValue; }

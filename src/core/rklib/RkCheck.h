@@ -79,18 +79,18 @@ RkResult checkEqual(const V& inValue, const E& inExpected, bool inWantEqual, int
 } // namespace Rk
 
 // Condition check: detail "cond[<inCondText>]". The message is only built on failure.
-#define RK_CHECK(inCond, inCondText, inMessage)                                                  \
-    ((inCond) ? RkResult()                                                                        \
-              : ::Rk::checkFailure(__LINE__, __FILE__, __PRETTY_FUNCTION__,                       \
-                                   ::Rk::checkText(inMessage),                                    \
-                                   std::string("cond[") + (inCondText) + "]"))
+#define RK_CHECK(inCond, inCondText, inMessage)                                                    \
+    ((inCond)                                                                                      \
+         ? RkResult()                                                                              \
+         : ::Rk::checkFailure(__LINE__, __FILE__, __PRETTY_FUNCTION__, ::Rk::checkText(inMessage), \
+                              std::string("cond[") + (inCondText) + "]"))
 
 // Equality check: detail "val[<value>]  exp[<expected>]".
-#define RK_CHECK_EQ(inValue, inExpected, inMessage)                                              \
-    ::Rk::checkEqual((inValue), (inExpected), true, __LINE__, __FILE__, __PRETTY_FUNCTION__,      \
+#define RK_CHECK_EQ(inValue, inExpected, inMessage)                                                \
+    ::Rk::checkEqual((inValue), (inExpected), true, __LINE__, __FILE__, __PRETTY_FUNCTION__,       \
                      [&]() { return ::Rk::checkText(inMessage); })
 
 // Inequality check: detail "val[<value>]  notexp[<forbidden>]".
-#define RK_CHECK_NE(inValue, inForbidden, inMessage)                                             \
-    ::Rk::checkEqual((inValue), (inForbidden), false, __LINE__, __FILE__, __PRETTY_FUNCTION__,    \
+#define RK_CHECK_NE(inValue, inForbidden, inMessage)                                               \
+    ::Rk::checkEqual((inValue), (inForbidden), false, __LINE__, __FILE__, __PRETTY_FUNCTION__,     \
                      [&]() { return ::Rk::checkText(inMessage); })

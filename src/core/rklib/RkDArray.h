@@ -11,8 +11,7 @@
 
 // Growable array kept with rkmalloc/rkrealloc/rkfree. Capacity doubles on growth, so
 // appending is amortised constant time. Elements keep their order.
-template <typename T>
-class RkDArray
+template <typename T> class RkDArray
 {
 public:
     RkDArray() = default;
@@ -32,8 +31,7 @@ public:
     RkDArray(RkDArray&& inOther) noexcept
         : mData(std::exchange(inOther.mData, nullptr)), mSize(std::exchange(inOther.mSize, 0)),
           mCapacity(std::exchange(inOther.mCapacity, 0))
-    {
-    }
+    {}
     RkDArray& operator=(RkDArray inOther) noexcept
     {
         swap(inOther);

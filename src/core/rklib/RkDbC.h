@@ -3,7 +3,13 @@
 #include "rklib/rklib_export.h"
 
 // Kinds of contract violations reported to the DbC callback.
-enum DbCEventType { DbCPrecondition = 0, DbCPostcondition = 1, DbCInvariant = 2, DbCAssertion = 3 };
+enum DbCEventType
+{
+    DbCPrecondition = 0,
+    DbCPostcondition = 1,
+    DbCInvariant = 2,
+    DbCAssertion = 3
+};
 
 // Called on a contract violation with (type, condition, file, line, function, message).
 using RkDbCCallback = void (*)(DbCEventType, const char*, const char*, unsigned, const char*,

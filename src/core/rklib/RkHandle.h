@@ -33,8 +33,7 @@ private:
 };
 
 // Holds one reference to an RkHandable.
-template <typename T>
-class RkHandle
+template <typename T> class RkHandle
 {
 public:
     RkHandle() = default;
@@ -45,10 +44,7 @@ public:
     }
     RkHandle(const RkHandle& inOther) : RkHandle(inOther.mObject) {}
     RkHandle(RkHandle&& inOther) noexcept : mObject(std::exchange(inOther.mObject, nullptr)) {}
-    template <typename U>
-    RkHandle(const RkHandle<U>& inOther) : RkHandle(inOther.get())
-    {
-    }
+    template <typename U> RkHandle(const RkHandle<U>& inOther) : RkHandle(inOther.get()) {}
     ~RkHandle()
     {
         if (mObject)

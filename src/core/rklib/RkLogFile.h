@@ -11,7 +11,8 @@
 #include <vector>
 
 // Log levels: 0 debug, 1 information, 2 warning, 3 error, 4 fatal; 5 switches a level off.
-enum RkLogLevel {
+enum RkLogLevel
+{
     RkLogDebug = 0,
     RkLogInfo = 1,
     RkLogWarning = 2,

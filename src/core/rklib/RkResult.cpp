@@ -9,13 +9,13 @@ RkResult::RkResult(Code inCode, int inLine, const char* inWhere, const char* inM
                    const char* inDetail)
     : mBad(inCode >= Error)
 {
-    mRecords.push_back(Record{inCode, inLine, textOf(inWhere), textOf(inMessage), textOf(inDetail)});
+    mRecords.push_back(
+        Record{inCode, inLine, textOf(inWhere), textOf(inMessage), textOf(inDetail)});
 }
 
 RkResult::RkResult(Code inCode, const char* inMessage, const char* inDetail)
     : RkResult(inCode, 0, "", inMessage, inDetail)
-{
-}
+{}
 
 void RkResult::makeBad(unsigned)
 {

@@ -11,7 +11,12 @@
 class RKLIB_EXPORT RkResult
 {
 public:
-    enum Code { Ok = 0, Warning = 1, Error = 2 };
+    enum Code
+    {
+        Ok = 0,
+        Warning = 1,
+        Error = 2
+    };
 
     // One failure record: where a check failed and what it tested.
     struct Record

@@ -53,7 +53,8 @@ struct RkStringHash
     }
 };
 
-// Splits a string into tokens separated by any of the delimiter characters; empty tokens are skipped.
+// Splits a string into tokens separated by any of the delimiter characters; empty tokens are
+// skipped.
 class RKLIB_EXPORT RkStringTokenizer
 {
 public:

@@ -42,7 +42,9 @@ void RkThread::start()
 bool RkThread::wait(unsigned long inMilliseconds)
 {
     std::unique_lock<std::mutex> lock(d->mutex);
-    const auto done = [this] { return !d->running; };
+    const auto done = [this] {
+        return !d->running;
+    };
     if (inMilliseconds == Forever)
         d->finished.wait(lock, done);
     else if (!d->finished.wait_for(lock, std::chrono::milliseconds(inMilliseconds), done))

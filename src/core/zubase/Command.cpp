@@ -81,8 +81,7 @@ const char* const sGeneralUsage =
 
 Command::Attribute::Attribute(const QString& inName, const QString& inValue)
     : mName(inName), mValue(inValue)
-{
-}
+{}
 
 Command::Attribute::~Attribute() = default;
 
@@ -166,8 +165,7 @@ RkResult Command::create(RkHandle<Command>& outCommand, const QString& inCommand
     return res;
 }
 
-RkResult Command::parseCommands(const QStringList& inArgs,
-                                RkDArray<RkHandle<Command>>& outCommands)
+RkResult Command::parseCommands(const QStringList& inArgs, RkDArray<RkHandle<Command>>& outCommands)
 {
     RkResult res;
     outCommands.clear();
@@ -277,9 +275,9 @@ RkResult Command::attribute1(RkHandle<Attribute>& outAttribute, QString inName,
         if (Tz::fail(RK_CHECK_EQ(arr.size(), 1,
                                  tr("The attribute '%1' must occur exactly once.").arg(inName))))
             res.makeBad(1);
-    } else if (Tz::fail(RK_CHECK(arr.size() < 2, "arr.size()<2",
-                                 tr("The attribute '%1' must not occur more than once.")
-                                     .arg(inName)))) {
+    } else if (Tz::fail(
+                   RK_CHECK(arr.size() < 2, "arr.size()<2",
+                            tr("The attribute '%1' must not occur more than once.").arg(inName)))) {
         res.makeBad(1);
     }
     if (arr.size() > 0)
