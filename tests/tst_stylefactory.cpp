@@ -1,4 +1,5 @@
 // Colour-scheme files, the style factory's palettes and switching, and styled widgets.
+#include "zubase/ZuApplication.h"
 #include "zubase/ZuStyle.h"
 #include "zubase/ZuStyleFactory.h"
 #include "zubase/ZuStyleFactory_p.h"
@@ -469,6 +470,15 @@ void tst_StyleFactory::themeChangeRestoresSchemePalette()
 
     observer.beforeNotify(nullptr, &themeChange);
     QCOMPARE(QGuiApplication::palette(), factory.standardPalette());
+
+    // The factory's own observer sees the events the application dispatches.
+    QVERIFY(ZuApplication::instance());
+    QApplication::setPalette(other);
+    QWidget window;
+    QCoreApplication::sendEvent(&window, &unrelated);
+    QCOMPARE(QGuiApplication::palette().color(QPalette::Window), QColor(Qt::yellow));
+    QCoreApplication::sendEvent(&window, &themeChange);
+    QCOMPARE(QGuiApplication::palette(), factory.standardPalette());
 }
 
 void tst_StyleFactory::styledWidgetColours_data()
@@ -552,5 +562,16 @@ void tst_StyleFactory::styledWidgetFollowsSchemeSwitch()
     QCOMPARE(rgb(kept.palette().color(QPalette::Base)), QStringLiteral("0,200,0,255"));
 }
 
-QTEST_MAIN(tst_StyleFactory)
+// The application object is the library's, so that the factory's hook sees every event.
+int main(int argc, char** argv)
+{
+    QCoreApplication::setAttribute(Qt::AA_Use96Dpi, true);
+    ZuApplication* application = ZuApplication::createInstance(argc, argv, nullptr);
+    if (!application)
+        return 1;
+    tst_StyleFactory test;
+    const int result = QTest::qExec(&test, argc, argv);
+    delete application;
+    return result;
+}
 #include "tst_stylefactory.moc"

@@ -118,9 +118,13 @@ ZuStyleFactory::ZuStyleFactory() : d(new ZuStyleFactoryPrivate)
     d->nativePalette = QGuiApplication::palette();
     if (QStyle* style = QApplication::style())
         d->nativeStyleClass = style->objectName();
+    ZuApplication::installHookNotify(&d->themeChangeObserver);
 }
 
-ZuStyleFactory::~ZuStyleFactory() = default;
+ZuStyleFactory::~ZuStyleFactory()
+{
+    ZuApplication::deInstallHookNotify(&d->themeChangeObserver);
+}
 
 bool ZuStyleFactory::addStyle(const QString& inFileName)
 {

@@ -2,6 +2,7 @@
 
 // Internal: the factory's private record and its theme-change observer.
 
+#include "zubase/ZuApplication.h"
 #include "zubase/ZuStyleFactory.h"
 
 #include <QColor>
@@ -24,13 +25,13 @@ struct ZuColorScheme
 
 // Puts the scheme palette back when the desktop theme changes, whatever the receiver of the
 // ThemeChange event. It sees every event of the process, so it only compares the type.
-class ThemeChangeObserver
+class ThemeChangeObserver : public ZuApplication::HookNotify
 {
 public:
     ThemeChangeObserver() = default;
-    virtual ~ThemeChangeObserver();
-    virtual void beforeNotify(QObject* inReceiver, QEvent* inEvent);
-    virtual void afterNotify(QObject* inReceiver, QEvent* inEvent);
+    ~ThemeChangeObserver() override;
+    void beforeNotify(QObject* inReceiver, QEvent* inEvent) override;
+    void afterNotify(QObject* inReceiver, QEvent* inEvent) override;
 };
 
 class ZuStyleFactoryPrivate
