@@ -99,6 +99,12 @@ public:
     using QCheckBox::initStyleOption;
 };
 
+class OptionTabBar : public QTabBar
+{
+public:
+    using QTabBar::initStyleOption;
+};
+
 } // namespace
 
 class tst_Style : public QObject
@@ -180,11 +186,11 @@ void tst_Style::boldTabLabelFromTabData()
     QTabBar bar;
     bar.setPalette(testPalette());
     bar.addTab(QStringLiteral("Findings"));
+    if (data.isValid())
+        bar.setTabData(0, data);
     bar.addTab(QStringLiteral("Findings"));
     bar.addTab(QStringLiteral("Current"));
     bar.setCurrentIndex(2); // the two compared tabs share the unselected look
-    if (data.isValid())
-        bar.setTabData(0, data);
     bar.resize(bar.sizeHint());
     const QImage image = grabImage(bar);
     auto ink = [](QRgb pixel) {
@@ -193,6 +199,8 @@ void tst_Style::boldTabLabelFromTabData()
     const int first = countPixels(image, bar.tabRect(0), ink);
     const int second = countPixels(image, bar.tabRect(1), ink);
     QVERIFY(second > 20);
+    // A bold label gets a tab wide enough for bold text.
+    QCOMPARE(bar.tabRect(0).width() > bar.tabRect(1).width(), bold);
     if (bold)
         QVERIFY2(first > second * 11 / 10,
                  qPrintable(QStringLiteral("%1 vs %2").arg(first).arg(second)));
@@ -232,7 +240,7 @@ void tst_Style::tabSpaceWithButtons()
         QTabBar plain;
         plain.setExpanding(false);
         plain.addTab(QStringLiteral("Series"));
-        QTabBar closable;
+        OptionTabBar closable;
         closable.setExpanding(false);
         closable.setTabsClosable(true);
         closable.addTab(QStringLiteral("Series"));
@@ -241,6 +249,12 @@ void tst_Style::tabSpaceWithButtons()
         const int plainWidth = plain.tabRect(0).width();
         const int closableWidth = closable.tabRect(0).width();
         QCOMPARE(closableWidth - close->sizeHint().width(), plainWidth - baseH + 8 + 4);
+        // ... and its label still has room for the whole text.
+        QStyleOptionTab tabOption;
+        closable.initStyleOption(&tabOption, 0);
+        QVERIFY(
+            appStyle()->subElementRect(QStyle::SE_TabBarTabText, &tabOption, &closable).width() >=
+            closable.fontMetrics().horizontalAdvance(QStringLiteral("Series")));
     }
 }
 

@@ -1,5 +1,7 @@
 #include "DemoWindow.h"
 
+#include "DemoSchemePage.h"
+
 #include "zubase/Command.h"
 
 #include <QLabel>
@@ -21,6 +23,7 @@ DemoWindow::DemoWindow(QWidget* inParent) : QMainWindow(inParent)
     usage->setPlainText(ZuBase::Command::usage(QString(), false));
     usageLayout->addWidget(usage);
     tabs->addTab(usagePage, tr("Commands"));
+    tabs->addTab(new DemoSchemePage(tabs), tr("Colour schemes"));
 
     setCentralWidget(tabs);
     resize(720, 520);

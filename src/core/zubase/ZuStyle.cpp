@@ -78,6 +78,32 @@ int largeIconSize(const QWidget* inWidget)
     return static_cast<int>(32.0 * state().scaling(inWidget));
 }
 
+// Tabs are sized with the bar's font; a label drawn bold needs the extra width of bold text.
+// The option names no index: the tab is the one under its rectangle from the last layout, or,
+// for a tab not laid out yet, the first one with this text.
+int boldTabExtraWidth(const QStyleOption* inOption, const QWidget* inWidget)
+{
+    const auto* tabBar = qobject_cast<const QTabBar*>(inWidget);
+    const auto* tab = qstyleoption_cast<const QStyleOptionTab*>(inOption);
+    if (!tabBar || !tab || tab->text.isEmpty())
+        return 0;
+    int index = tab->rect.isValid() ? tabBar->tabAt(tab->rect.center()) : -1;
+    if (index < 0 || tabBar->tabText(index) != tab->text) {
+        index = -1;
+        for (int i = 0; i < tabBar->count() && index < 0; ++i) {
+            if (tabBar->tabText(i) == tab->text)
+                index = i;
+        }
+    }
+    if (index < 0 || !tabBar->tabData(index).toBool())
+        return 0;
+    QFont bold = tabBar->font();
+    bold.setWeight(75);
+    const int extra = QFontMetrics(bold).horizontalAdvance(tab->text) -
+                      tabBar->fontMetrics().horizontalAdvance(tab->text);
+    return qMax(0, extra);
+}
+
 bool hasTabButtons(const QStyleOption* inOption)
 {
     const auto* tab = qstyleoption_cast<const QStyleOptionTab*>(inOption);
@@ -181,7 +207,30 @@ QSize ZuStyle::sizeFromContents(ContentsType inType, const QStyleOption* inOptio
     // current menu icon size set here.
     if (inType == CT_MenuItem)
         state().menuIconSize = isLargeIconMenu(inWidget) ? largeIconSize(inWidget) : 16;
-    return QProxyStyle::sizeFromContents(inType, inOption, inContentsSize, inWidget);
+    QSize size = QProxyStyle::sizeFromContents(inType, inOption, inContentsSize, inWidget);
+    if (inType == CT_TabBarTab)
+        size.rwidth() += boldTabExtraWidth(inOption, inWidget);
+    return size;
+}
+
+QRect ZuStyle::subElementRect(SubElement inElement, const QStyleOption* inOption,
+                              const QWidget* inWidget) const
+{
+    QRect rect = QProxyStyle::subElementRect(inElement, inOption, inWidget);
+    if (inElement == SE_TabBarTabText && hasTabButtons(inOption)) {
+        // Cleanlooks leaves room for its own, wider spacing; hand back the difference.
+        const int dh = baseStyle()->pixelMetric(PM_TabBarTabHSpace, inOption, inWidget) / 2 - 4;
+        const int dv = baseStyle()->pixelMetric(PM_TabBarTabVSpace, inOption, inWidget) / 2 - 2;
+        const auto* tab = qstyleoption_cast<const QStyleOptionTab*>(inOption);
+        const bool vertical =
+            tab->shape == QTabBar::RoundedWest || tab->shape == QTabBar::RoundedEast ||
+            tab->shape == QTabBar::TriangularWest || tab->shape == QTabBar::TriangularEast;
+        if (vertical)
+            rect.adjust(dv, -dh, -dv, dh);
+        else
+            rect.adjust(-dh, dv, dh, -dv);
+    }
+    return rect;
 }
 
 int ZuStyle::styleHint(StyleHint inHint, const QStyleOption* inOption, const QWidget* inWidget,

@@ -49,6 +49,9 @@ public:
     QSize sizeFromContents(ContentsType inType, const QStyleOption* inOption,
                            const QSize& inContentsSize,
                            const QWidget* inWidget = nullptr) const override;
+    // The text room of a tab with buttons follows this style's tab spacing, not Cleanlooks'.
+    QRect subElementRect(SubElement inElement, const QStyleOption* inOption,
+                         const QWidget* inWidget = nullptr) const override;
     int styleHint(StyleHint inHint, const QStyleOption* inOption = nullptr,
                   const QWidget* inWidget = nullptr,
                   QStyleHintReturn* outReturnData = nullptr) const override;

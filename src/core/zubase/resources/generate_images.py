@@ -147,9 +147,9 @@ def logo():
                 if cell == "#":
                     x0, y0 = x + gx * 2, 14 + gy * 3
                     c.fill(lambda px, py, x0=x0, y0=y0: x0 <= px < x0 + 2 and y0 <= py < y0 + 3,
-                           (45, 52, 62, 255))
+                           (54, 132, 201, 255))
         x += 11
-    c.fill(lambda px, py: 47 <= px < 112 and 37 <= py < 39, (54, 132, 201, 255))
+    c.fill(lambda px, py: 47 <= px < 112 and 37 <= py < 39, (33, 97, 163, 255))
     c.save("Tessel7.png")
 
 
