@@ -122,6 +122,8 @@ private slots:
     void largeMenuIcons();
     void checkMarkFollowsBase_data();
     void checkMarkFollowsBase();
+    void menuCheckMark_data();
+    void menuCheckMark();
     void checkBoxBackground_data();
     void checkBoxBackground();
     void radioDot();
@@ -335,6 +337,46 @@ void tst_Style::checkMarkFollowsBase()
         countPixels(image, inside, [&](QRgb p) { return qGray(p) > baseGrey + 60; });
     QCOMPARE(darker > 3, expected < 0);
     QCOMPARE(lighter > 3, expected > 0);
+}
+
+void tst_Style::menuCheckMark_data()
+{
+    QTest::addColumn<QColor>("base");
+    QTest::addColumn<QColor>("window");
+    QTest::addColumn<bool>("darkMark");
+    // On a light scheme the light mark is inverted (XOR) so that it shows as a dark mark.
+    QTest::newRow("light base") << QColor(Qt::white) << QColor(235, 235, 235) << true;
+    QTest::newRow("dark base") << QColor(40, 40, 40) << QColor(60, 60, 60) << false;
+}
+
+void tst_Style::menuCheckMark()
+{
+    QFETCH(QColor, base);
+    QFETCH(QColor, window);
+    QFETCH(bool, darkMark);
+    QMenu menu;
+    QPalette palette = testPalette(base);
+    palette.setColor(QPalette::Window, window);
+    menu.setPalette(palette);
+    QAction* checked = menu.addAction(QStringLiteral("Show overlay"));
+    checked->setCheckable(true);
+    checked->setChecked(true);
+    QAction* unchecked = menu.addAction(QStringLiteral("Show ruler"));
+    unchecked->setCheckable(true);
+    menu.resize(menu.sizeHint());
+    const QImage image = grabImage(menu);
+
+    // The check column is the part of the item left of the text.
+    auto column = [&](QAction* action) {
+        const QRect item = menu.actionGeometry(action);
+        return QRect(item.left(), item.top(), 22, item.height());
+    };
+    auto mark = [&](QRgb p) {
+        return darkMark ? qGray(p) < qGray(window.rgb()) - 100
+                        : qGray(p) > qGray(window.rgb()) + 100;
+    };
+    QVERIFY(countPixels(image, column(checked), mark) > 5);
+    QCOMPARE(countPixels(image, column(unchecked), mark), 0);
 }
 
 void tst_Style::checkBoxBackground_data()

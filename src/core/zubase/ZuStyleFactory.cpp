@@ -317,8 +317,9 @@ bool ZuStyleFactory::currentStyleIsOSNative() const
 
 bool ZuStyleFactory::currentStyleIsTesselNative() const
 {
-    const QColor midlight = const_cast<ZuStyleFactory*>(this)->standardPalette().color(
-        QPalette::Active, QPalette::Midlight);
+    const auto scheme = d->schemes.constFind(d->currentName);
+    const QPalette palette = scheme == d->schemes.constEnd() ? QPalette() : scheme->palette;
+    const QColor midlight = palette.color(QPalette::Active, QPalette::Midlight);
     return ((11 * midlight.red() + 16 * midlight.green() + 5 * midlight.blue()) >> 5) > 200;
 }
 
