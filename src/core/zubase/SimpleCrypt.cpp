@@ -39,39 +39,54 @@ char randomByte()
     QT_WARNING_POP
 }
 
-// out[p] = in[p] ^ key[p % 8] ^ out[p - 1], in place.
-void encodeChained(uchar* ioData, qint64 inSize, const uchar* inKey)
+// Encodes block positions [inFrom, inFrom + inSize) from inPlain to outCypher:
+// out[p] = in[p] ^ key[p % 8] ^ out[p - 1], with ioLast carrying out[p - 1] (0 before the block).
+// Input and output may be the same bytes.
+void encodeChained(const uchar* inPlain, uchar* outCypher, qint64 inSize, qint64 inFrom,
+                   const uchar* inKey, uchar& ioLast)
 {
-    uchar last = 0;
-    qint64 p = 0;
-    for (; p + 8 <= inSize; p += 8) {
+    uchar last = ioLast;
+    qint64 i = 0;
+    for (; i < inSize && ((inFrom + i) & 7) != 0; ++i) {
+        last = inPlain[i] ^ inKey[(inFrom + i) & 7] ^ last;
+        outCypher[i] = last;
+    }
+    // Whole rounds of the key, so that the key index is a constant in the inner loop.
+    for (; i + 8 <= inSize; i += 8) {
         for (int k = 0; k < 8; ++k) {
-            last = ioData[p + k] ^ inKey[k] ^ last;
-            ioData[p + k] = last;
+            last = inPlain[i + k] ^ inKey[k] ^ last;
+            outCypher[i + k] = last;
         }
     }
-    for (; p < inSize; ++p) {
-        last = ioData[p] ^ inKey[p & 7] ^ last;
-        ioData[p] = last;
+    for (; i < inSize; ++i) {
+        last = inPlain[i] ^ inKey[(inFrom + i) & 7] ^ last;
+        outCypher[i] = last;
     }
+    ioLast = last;
 }
 
-// plain[p] = in[p] ^ key[p % 8] ^ in[p - 1], in place.
-void decodeChained(uchar* ioData, qint64 inSize, const uchar* inKey)
+// Decodes block positions [inFrom, inFrom + inSize) of inBlock (the whole encoded block) to
+// outPlain: plain[p] = in[p] ^ key[p % 8] ^ in[p - 1], with in[-1] taken as 0.
+void decodeChained(const uchar* inBlock, uchar* outPlain, qint64 inSize, qint64 inFrom,
+                   const uchar* inKey)
 {
-    uchar previous = 0;
-    qint64 p = 0;
-    for (; p + 8 <= inSize; p += 8) {
+    const uchar* in = inBlock + inFrom;
+    uchar previous = inFrom > 0 ? in[-1] : 0;
+    qint64 i = 0;
+    for (; i < inSize && ((inFrom + i) & 7) != 0; ++i) {
+        outPlain[i] = in[i] ^ inKey[(inFrom + i) & 7] ^ previous;
+        previous = in[i];
+    }
+    for (; i + 8 <= inSize; i += 8) {
         for (int k = 0; k < 8; ++k) {
-            const uchar in = ioData[p + k];
-            ioData[p + k] = in ^ inKey[k] ^ previous;
-            previous = in;
+            const uchar c = in[i + k];
+            outPlain[i + k] = c ^ inKey[k] ^ previous;
+            previous = c;
         }
     }
-    for (; p < inSize; ++p) {
-        const uchar in = ioData[p];
-        ioData[p] = in ^ inKey[p & 7] ^ previous;
-        previous = in;
+    for (; i < inSize; ++i) {
+        outPlain[i] = in[i] ^ inKey[(inFrom + i) & 7] ^ previous;
+        previous = in[i];
     }
 }
 
@@ -193,16 +208,18 @@ QByteArray SimpleCrypt::encryptToByteArray(QByteArray inPlain)
         integrity = QCryptographicHash::hash(payload, QCryptographicHash::Sha1);
     }
 
-    // One allocation for the whole frame; the XOR pass then runs in place over the block.
-    QByteArray frame(2 + 1 + integrity.size() + payload.size(), Qt::Uninitialized);
-    char* out = frame.data();
-    out[0] = kVersion;
-    out[1] = flags;
-    out[2] = randomByte();
-    std::memcpy(out + 3, integrity.constData(), size_t(integrity.size()));
-    std::memcpy(out + 3 + integrity.size(), payload.constData(), size_t(payload.size()));
-    encodeChained(reinterpret_cast<uchar*>(out + 2), frame.size() - 2,
-                  reinterpret_cast<const uchar*>(mKeyParts.constData()));
+    // One allocation for the whole frame, the payload encoded straight into it.
+    const QByteArray head = char(randomByte()) + integrity;
+    QByteArray frame(2 + head.size() + payload.size(), Qt::Uninitialized);
+    auto* out = reinterpret_cast<uchar*>(frame.data());
+    const auto* key = reinterpret_cast<const uchar*>(mKeyParts.constData());
+    out[0] = uchar(kVersion);
+    out[1] = uchar(flags);
+    uchar last = 0;
+    encodeChained(reinterpret_cast<const uchar*>(head.constData()), out + 2, head.size(), 0, key,
+                  last);
+    encodeChained(reinterpret_cast<const uchar*>(payload.constData()), out + 2 + head.size(),
+                  payload.size(), head.size(), key, last);
 
     mLastError = NoError;
     return frame;
@@ -242,29 +259,32 @@ QByteArray SimpleCrypt::decryptToByteArray(QByteArray inCypher)
     }
 
     const char flags = inCypher.at(1);
-    QByteArray block = inCypher.mid(2);
-    decodeChained(reinterpret_cast<uchar*>(block.data()), block.size(),
-                  reinterpret_cast<const uchar*>(mKeyParts.constData()));
-    block.remove(0, 1); // the random byte
+    const auto* encoded = reinterpret_cast<const uchar*>(inCypher.constData()) + 2;
+    const qint64 blockSize = inCypher.size() - 2;
+    const auto* key = reinterpret_cast<const uchar*>(mKeyParts.constData());
+
+    // The random byte and the integrity field are decoded apart from the payload, so that the
+    // payload is decoded once, straight into its own array.
+    const int fieldSize =
+        (flags & kFlagChecksum) ? kChecksumSize : ((flags & kFlagHash) ? kHashSize : 0);
+    if (blockSize < 1 + fieldSize) {
+        mLastError = IntegrityError;
+        return QByteArray();
+    }
+    uchar field[1 + kHashSize];
+    decodeChained(encoded, field, 1 + fieldSize, 0, key);
+    QByteArray block(int(blockSize - 1 - fieldSize), Qt::Uninitialized);
+    decodeChained(encoded, reinterpret_cast<uchar*>(block.data()), block.size(), 1 + fieldSize,
+                  key);
 
     if (flags & kFlagChecksum) {
-        if (block.size() < kChecksumSize) {
-            mLastError = IntegrityError;
-            return QByteArray();
-        }
-        const quint16 stored = quint16((uchar(block.at(0)) << 8) | uchar(block.at(1)));
-        block.remove(0, kChecksumSize);
+        const quint16 stored = quint16((field[1] << 8) | field[2]);
         if (stored != qChecksum(block.constData(), uint(block.size()))) {
             mLastError = IntegrityError;
             return QByteArray();
         }
     } else if (flags & kFlagHash) {
-        if (block.size() < kHashSize) {
-            mLastError = IntegrityError;
-            return QByteArray();
-        }
-        const QByteArray stored = block.left(kHashSize);
-        block.remove(0, kHashSize);
+        const QByteArray stored(reinterpret_cast<const char*>(field + 1), kHashSize);
         if (stored != QCryptographicHash::hash(block, QCryptographicHash::Sha1)) {
             mLastError = IntegrityError;
             return QByteArray();
