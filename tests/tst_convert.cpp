@@ -54,6 +54,7 @@ private slots:
     void expandEnvironmentVariables();
     void replaceFillers_data();
     void replaceFillers();
+    void randomText();
     void resizeWidgetToViewport();
     void caseInsensitive_data();
     void caseInsensitive();
@@ -243,6 +244,40 @@ void TestConvert::replaceFillers()
     QFETCH(QChar, fill);
     QFETCH(QString, expected);
     QCOMPARE(Zu::replaceFillers(text, fillers, fill), expected);
+}
+
+// Random texts from the characters that matter to the parsers: no hang, no crash, and the
+// properties callers rely on.
+void TestConvert::randomText()
+{
+    QRandomGenerator generator(42);
+    const QString alphabet = QStringLiteral("%${}-/ :0123456789ZU_ASELFGROWMar\t");
+    for (int round = 0; round < 5000; ++round) {
+        QString text;
+        const int length = int(generator.bounded(24));
+        for (int i = 0; i < length; ++i)
+            text += alphabet.at(int(generator.bounded(alphabet.size())));
+
+        const QTime time = Zu::timeFromString(text);
+        if (time.isValid())
+            QVERIFY(time.toString(QStringLiteral("hh:mm:ss")) == text ||
+                    time.toString(QStringLiteral("hhmmss")) == text);
+        Zu::dateFromString(text); // only must not crash
+
+        // At most 256 replacements of values no longer than "%ZU_GROW%x".
+        const QString expanded = Zu::expandEnvironmentVariables(text);
+        QVERIFY(expanded.size() <= text.size() + 10 * Zu::maxEnvironmentReplacements);
+        if (!text.contains(QLatin1Char('%')) && !text.contains(QLatin1String("${")))
+            QCOMPARE(expanded, text);
+
+        const QString filled = Zu::replaceFillers(text, QStringLiteral("-/"), QLatin1Char(' '));
+        QVERIFY(!filled.startsWith(QLatin1Char(' ')) && !filled.endsWith(QLatin1Char(' ')));
+        QVERIFY(!filled.contains(QLatin1String("  ")) && !filled.contains(QLatin1Char('-')) &&
+                !filled.contains(QLatin1Char('/')));
+        QString stripped = text;
+        stripped.remove(QRegularExpression(QStringLiteral("[-/ ]")));
+        QCOMPARE(QString(filled).remove(QLatin1Char(' ')), stripped);
+    }
 }
 
 void TestConvert::resizeWidgetToViewport()

@@ -35,8 +35,6 @@ private slots:
     void createHtml();
     void cellAt_data();
     void cellAt();
-    void enumerationTexts();
-    void copiesAreIndependent();
 };
 
 void TestHtml::createHtml_data()
@@ -169,31 +167,6 @@ void TestHtml::cellAt()
         QCOMPARE(cell->text(), text);
         QCOMPARE(cell, &table[row][column]); // the cell itself, not a copy
     }
-}
-
-void TestHtml::enumerationTexts()
-{
-    // Values are stored by hosts; unknown values give empty texts.
-    QCOMPARE(int(ZuHtmlTable::AlignJustify), 3);
-    QCOMPARE(int(ZuHtmlTable::CellStyle), 4);
-    QCOMPARE(int(ZuHtmlTable::TableCellPadding), 4);
-    QCOMPARE(ZuHtmlTable::alignmentText(ZuHtmlTable::Alignment(4)), QString());
-    QCOMPARE(ZuHtmlTable::attributeName(ZuHtmlTable::CellAttribute(5)), QString());
-    QCOMPARE(ZuHtmlTable::attributeName(ZuHtmlTable::TableAttribute(-1)), QString());
-    QCOMPARE(ZuHtmlTable::attributeName(ZuHtmlTable::CellColSpan), QStringLiteral("colspan"));
-    QCOMPARE(ZuHtmlTable::attributeName(ZuHtmlTable::TableCellSpacing),
-             QStringLiteral("cellspacing"));
-}
-
-void TestHtml::copiesAreIndependent()
-{
-    ZuHtmlTable original = exampleTable();
-    const QString before = original.createHtml();
-    ZuHtmlTable copy = original;
-    copy[0][0].setText(QStringLiteral("changed"));
-    copy.setAttribute(ZuHtmlTable::TableBorder, 0);
-    QCOMPARE(original.createHtml(), before);
-    QVERIFY(copy.createHtml().contains(QLatin1String("<td>changed</td>")));
 }
 
 QTEST_GUILESS_MAIN(TestHtml)

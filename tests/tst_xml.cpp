@@ -276,11 +276,6 @@ void TestXml::writerWithoutDevice()
     writer.writeSectionComment(QStringLiteral("c"));
     QVERIFY(buffer.data().isEmpty());
 
-    // The host's flag is kept and nothing else.
-    QVERIFY(!writer.writeDefaultValues());
-    writer.setWriteDefaultValues(true);
-    QVERIFY(writer.writeDefaultValues());
-
     // Tabs as auto-formatting indent count as one blank per step.
     QByteArray out;
     ZuXmlStreamWriter tabs(&out);
