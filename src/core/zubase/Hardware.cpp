@@ -126,11 +126,17 @@ RkResult getDiskFreeSpaceMB(const QString& inPath, unsigned int& outFreeMB, floa
         res.makeBad(1);
         return res;
     }
-    outUsedPercent =
-        static_cast<float>((static_cast<double>(totalBytes) - static_cast<double>(freeBytes)) *
-                           100.0 / (static_cast<double>(totalBytes) + 1.0));
-    outFreeMB = static_cast<unsigned int>(freeBytes >> 20);
+    diskSpaceFromBytes(freeBytes, totalBytes, outFreeMB, outUsedPercent);
     return res;
+}
+
+void diskSpaceFromBytes(quint64 inFreeBytes, quint64 inTotalBytes, unsigned int& outFreeMB,
+                        float& outUsedPercent)
+{
+    outUsedPercent =
+        static_cast<float>((static_cast<double>(inTotalBytes) - static_cast<double>(inFreeBytes)) *
+                           100.0 / (static_cast<double>(inTotalBytes) + 1.0));
+    outFreeMB = static_cast<unsigned int>(inFreeBytes >> 20);
 }
 
 } // namespace ZuBase

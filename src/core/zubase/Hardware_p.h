@@ -13,4 +13,9 @@ namespace ZuBase {
 ZUBASE_EXPORT void parseDmiDecodeOutput(const QByteArray& inOutput, QString& ioProductName,
                                         QString& ioSerialNumber, QString& ioBios);
 
+// Free megabytes (whole MiB, rounded down, in 32 bits) and the used percentage
+// (total - free) * 100 / (total + 1) out of the byte counts of a file system.
+ZUBASE_EXPORT void diskSpaceFromBytes(quint64 inFreeBytes, quint64 inTotalBytes,
+                                      unsigned int& outFreeMB, float& outUsedPercent);
+
 } // namespace ZuBase

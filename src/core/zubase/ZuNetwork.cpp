@@ -7,6 +7,7 @@
 
 #include <QHostAddress>
 
+#include <algorithm>
 #include <cerrno>
 
 namespace ZuNetwork {
