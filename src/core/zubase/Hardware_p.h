@@ -1,8 +1,6 @@
 #pragma once
 
 // Internal: the reading of the DMI tool's output, apart from starting the tool.
-#include "zubase/zubase_export.h"
-
 #include <QByteArray>
 #include <QString>
 
@@ -10,12 +8,12 @@ namespace ZuBase {
 
 // Reads the "BIOS Information" and "System Information" sections of "dmidecode -q" output.
 // Texts not found stay as they are given (the caller starts them as "N/A").
-ZUBASE_EXPORT void parseDmiDecodeOutput(const QByteArray& inOutput, QString& ioProductName,
-                                        QString& ioSerialNumber, QString& ioBios);
+void parseDmiDecodeOutput(const QByteArray& inOutput, QString& ioProductName,
+                          QString& ioSerialNumber, QString& ioBios);
 
 // Free megabytes (whole MiB, rounded down, in 32 bits) and the used percentage
 // (total - free) * 100 / (total + 1) out of the byte counts of a file system.
-ZUBASE_EXPORT void diskSpaceFromBytes(quint64 inFreeBytes, quint64 inTotalBytes,
-                                      unsigned int& outFreeMB, float& outUsedPercent);
+void diskSpaceFromBytes(quint64 inFreeBytes, quint64 inTotalBytes, unsigned int& outFreeMB,
+                        float& outUsedPercent);
 
 } // namespace ZuBase

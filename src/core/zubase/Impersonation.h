@@ -64,7 +64,8 @@ private:
 // Enables or removes one privilege of a token; a token of -1 means the current process. On
 // Linux privileges are capabilities of the calling thread ("SeRestorePrivilege" is
 // CAP_DAC_OVERRIDE, "SeBackupPrivilege" CAP_DAC_READ_SEARCH, others by their capability name
-// such as "cap_net_raw"); removing one drops it for good.
+// such as "cap_net_raw"); removing one drops it for good, and enabling one that is not held
+// leaves it absent without a failure.
 ZUBASE_EXPORT RkResult win32TokenAdjustPrivilege(void* const inToken, char* const inPrivilegeName,
                                                  bool inEnable);
 // Writes the groups and privileges of a token (-1: the current process) to the log between

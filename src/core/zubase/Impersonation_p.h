@@ -1,8 +1,6 @@
 #pragma once
 
 // Internal: the texts and name rules of the impersonation family, apart from the system calls.
-#include "zubase/zubase_export.h"
-
 #include <QString>
 
 #include <cstdint>
@@ -19,17 +17,17 @@ struct LogonName
 
 // "domain\name" -> name in domain; "name@domain" -> the whole text, no domain; "name" -> name
 // in ".".
-ZUBASE_EXPORT LogonName splitLogonName(const QString& inUser);
+LogonName splitLogonName(const QString& inUser);
 // The user name handed to PAM: the name for a local account (domain "." or this machine's
 // name), the whole name of a user principal name, else "domain\name".
-ZUBASE_EXPORT QString pamUserName(const LogonName& inName);
+QString pamUserName(const LogonName& inName);
 
 // " SE_GROUP_MANDATORY SE_GROUP_ENABLED ..." for a group's attribute bits.
-ZUBASE_EXPORT QString groupFlagsText(std::uint32_t inAttributes);
+QString groupFlagsText(std::uint32_t inAttributes);
 // "[sid]  [domain\\name]  [flags]" (two backslashes between domain and name).
-ZUBASE_EXPORT QString groupText(const QString& inSid, const QString& inDomain,
-                                const QString& inName, std::uint32_t inAttributes);
+QString groupText(const QString& inSid, const QString& inDomain, const QString& inName,
+                  std::uint32_t inAttributes);
 // "name  [0x<attributes in lower-case hex>]".
-ZUBASE_EXPORT QString privilegeText(const QString& inName, std::uint32_t inAttributes);
+QString privilegeText(const QString& inName, std::uint32_t inAttributes);
 
 } // namespace ZuBase

@@ -85,9 +85,10 @@ int accountsGetTokenInformation(const AccountToken* inToken, TokenInformation in
 // ("cap_net_raw"). EINVAL for an unknown name or number.
 int accountsLookupPrivilegeValue(const std::string& inName, std::uint32_t& outPrivilege);
 int accountsLookupPrivilegeName(std::uint32_t inPrivilege, std::string& outName);
-// With kPrivilegeEnabled raises the privilege in the effective set (EPERM when it is not held
-// or the thread is impersonating); with kPrivilegeRemoved drops it from the effective,
-// permitted and inheritable sets for good.
+// With kPrivilegeEnabled raises the privilege in the effective set; one that the token does not
+// hold (or any, while the thread impersonates) stays absent without a failure, as the system
+// leaves unassigned privileges. With kPrivilegeRemoved drops it from the effective, permitted
+// and inheritable sets for good.
 int accountsAdjustPrivilege(AccountToken* inToken, std::uint32_t inPrivilege,
                             std::uint32_t inAttributes);
 

