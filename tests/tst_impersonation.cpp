@@ -101,7 +101,6 @@ private slots:
     void splitLogonName();
     void groupFlags_data();
     void groupFlags();
-    void pamServiceName();
     void tokenLogOfProcess();
     void tokenLogOfNoToken();
     void tokenLogOfUnnamedGroup();
@@ -217,19 +216,6 @@ void TestImpersonation::groupFlags()
     QCOMPARE(ZuBase::privilegeText("SeDebugPrivilege", attributes),
              "SeDebugPrivilege  [0x" + QString::number(attributes, 16) + "]");
     QCOMPARE(ZuBase::privilegeText("SeBackupPrivilege", 3), QString("SeBackupPrivilege  [0x3]"));
-}
-
-void TestImpersonation::pamServiceName()
-{
-    qunsetenv("ZUBASE_PAM_SERVICE");
-    QCOMPARE(ZuBase::Win32Impersonation::pamServiceName(), QString("zubase"));
-    qputenv("ZUBASE_PAM_SERVICE", "site-logon");
-    QCOMPARE(ZuBase::Win32Impersonation::pamServiceName(), QString("site-logon"));
-    ZuBase::Win32Impersonation::setPamServiceName("host-logon");
-    QCOMPARE(ZuBase::Win32Impersonation::pamServiceName(), QString("host-logon"));
-    ZuBase::Win32Impersonation::setPamServiceName(QString());
-    qunsetenv("ZUBASE_PAM_SERVICE");
-    QCOMPARE(ZuBase::Win32Impersonation::pamServiceName(), QString("zubase"));
 }
 
 void TestImpersonation::tokenLogOfProcess()
