@@ -471,6 +471,11 @@ void TestImpersonation::impersonationIsPerThread()
 void TestImpersonation::impersonateFailure()
 {
     RkLogCapture capture;
+    // Handles that were never handed out are refused, not followed.
+    int notAToken = 0;
+    QVERIFY(ZuBase::Win32Impersonation::impersonate(&notAToken).isBad());
+    QVERIFY(ZuBase::win32TokenAdjustPrivilege(&notAToken, (char*)"cap_kill", false).isBad());
+    capture.clear();
     const RkResult res = ZuBase::Win32Impersonation::impersonate(nullptr);
     QVERIFY(res.isBad());
     QCOMPARE(int(res.records().size()), 1);

@@ -254,7 +254,17 @@ bool Win32Impersonation::login()
 RkResult Win32Impersonation::impersonate(void* inToken)
 {
     RkResult res;
-    const int error = ZuPlatform::accountsImpersonate(accountToken(inToken));
+    int error = 0;
+    if (inToken == sInvalidHandle) {
+        // The process's own token: the thread takes the identity it has anyway.
+        ZuPlatform::AccountToken* own = nullptr;
+        error = ZuPlatform::accountsOpenProcessToken(own);
+        if (error == 0)
+            error = ZuPlatform::accountsImpersonate(own);
+        ZuPlatform::accountsCloseToken(own);
+    } else {
+        error = ZuPlatform::accountsImpersonate(accountToken(inToken));
+    }
     const QByteArray threadId =
         QByteArray::number(qulonglong(ZuPlatform::accountsCurrentThreadId()));
     if (Tz::logWinFunc(error == 0 ? 1 : 0, 1, "::ImpersonateLoggedOnUser", threadId.constData(),

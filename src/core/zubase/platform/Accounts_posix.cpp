@@ -4,8 +4,10 @@
 #include <cstdlib>
 #include <cstring>
 #include <grp.h>
+#include <mutex>
 #include <pwd.h>
 #include <security/pam_appl.h>
+#include <set>
 #include <strings.h>
 #include <sys/capability.h>
 #include <sys/syscall.h>
@@ -33,6 +35,24 @@ struct SavedIdentity
     std::vector<gid_t> groups;
 };
 thread_local SavedIdentity tSaved;
+
+// Live tokens: a handle that was never handed out or is already closed is refused, as the
+// system refuses an invalid handle, instead of being dereferenced.
+std::mutex sTokensMutex;
+std::set<const AccountToken*> sTokens;
+
+AccountToken* registerToken(AccountToken* inToken)
+{
+    std::lock_guard<std::mutex> lock(sTokensMutex);
+    sTokens.insert(inToken);
+    return inToken;
+}
+
+bool isLive(const AccountToken* inToken)
+{
+    std::lock_guard<std::mutex> lock(sTokensMutex);
+    return inToken && sTokens.count(inToken) != 0;
+}
 
 // The raw system calls change the calling thread only; the libc wrappers would change every
 // thread of the process.
@@ -206,7 +226,7 @@ int accountsLogon(const std::string& inService, const std::string& inUser,
         delete token;
         return error;
     }
-    outToken = token;
+    outToken = registerToken(token);
     return 0;
 }
 
@@ -221,19 +241,24 @@ int accountsOpenProcessToken(AccountToken*& outToken)
         if (group != token->gid)
             token->groups.push_back(group);
     }
-    outToken = token;
+    outToken = registerToken(token);
     return 0;
 }
 
 void accountsCloseToken(AccountToken* inToken)
 {
+    {
+        std::lock_guard<std::mutex> lock(sTokensMutex);
+        if (sTokens.erase(inToken) == 0)
+            return;
+    }
     delete inToken;
 }
 
 int accountsImpersonate(const AccountToken* inToken)
 {
-    if (!inToken)
-        return EINVAL;
+    if (!isLive(inToken))
+        return EBADF;
     // Start from the thread's own identity, so that the privileges needed for the change are
     // in effect and a later revert finds what to return to.
     if (tSaved.impersonating) {
@@ -288,7 +313,7 @@ int accountsGetTokenInformation(const AccountToken* inToken, TokenInformation in
                                 void* ioBuffer, std::size_t inSize, std::size_t& outNeeded)
 {
     outNeeded = 0;
-    if (!inToken)
+    if (!isLive(inToken))
         return EBADF;
     if (inClass == TokenInformation::Groups) {
         std::vector<TokenGroupEntry> entries;
@@ -370,7 +395,7 @@ int accountsLookupPrivilegeName(std::uint32_t inPrivilege, std::string& outName)
 int accountsAdjustPrivilege(AccountToken* inToken, std::uint32_t inPrivilege,
                             std::uint32_t inAttributes)
 {
-    if (!inToken)
+    if (!isLive(inToken))
         return EBADF;
     if (inPrivilege > static_cast<std::uint32_t>(CAP_LAST_CAP))
         return EINVAL;
