@@ -515,6 +515,12 @@ void TestFile::junctionRoundTrip()
     QVERIFY(isJunction);
     QCOMPARE(outTarget, QDir::toNativeSeparators(target));
 
+    // A link made elsewhere with a relative target reports it from the link's folder.
+    QVERIFY(QFile::link("target dir", root.filePath("third")));
+    QVERIFY(ZuBase::File::junctionInfo(root.filePath("third"), isJunction, outTarget).isOk());
+    QVERIFY(isJunction);
+    QCOMPARE(outTarget, QDir::toNativeSeparators(root.path() + "/target dir"));
+
     // Removing the junction leaves the target's content alone.
     ZuBase::File::removeDir(junction, true, QStringList(), QStringList());
     QVERIFY(!QFileInfo(junction).isSymLink() && !QFileInfo::exists(junction));

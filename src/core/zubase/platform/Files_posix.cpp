@@ -144,8 +144,14 @@ int filesGetReparsePoint(ReparseHandle& ioHandle, std::vector<std::uint8_t>& out
     const ssize_t length = ::readlink(ioHandle.path.c_str(), target, PATH_MAX);
     if (length < 0)
         return errno == EINVAL ? kFilesNotAReparsePoint : errno;
-    const std::u16string name =
-        mountPointSubstituteName(toUtf16(std::string(target, static_cast<std::size_t>(length))));
+    std::string text(target, static_cast<std::size_t>(length));
+    // Junction targets are absolute; a relative link counts from the link's own folder.
+    if (text.empty() || text[0] != '/') {
+        const std::size_t slash = ioHandle.path.rfind('/');
+        text = (slash == std::string::npos ? std::string(".") : ioHandle.path.substr(0, slash)) +
+               "/" + text;
+    }
+    const std::u16string name = mountPointSubstituteName(toUtf16(text));
     outBuffer = mountPointBuild(name);
     if (outBuffer.size() > kReparseBufferMaxSize) {
         outBuffer.clear();
