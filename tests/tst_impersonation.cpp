@@ -418,12 +418,18 @@ void TestImpersonation::impersonationIsPerThread()
     if (!mAccountMade)
         QSKIP("useradd/chpasswd could not create the throwaway account");
 
-    RkLogCapture capture;
+    // A failed logon answers false and leaves no token, so the next login asks again.
+    const QString password = sPassword;
+    sPassword = "wrong";
     sCallbackCalls = 0;
+    QVERIFY(!ZuBase::Win32Impersonation::login());
+    sPassword = password;
+
+    RkLogCapture capture;
     QVERIFY(ZuBase::Win32Impersonation::login());
-    QCOMPARE(sCallbackCalls, 1);
+    QCOMPARE(sCallbackCalls, 2);
     QVERIFY(ZuBase::Win32Impersonation::login()); // the token is kept
-    QCOMPARE(sCallbackCalls, 1);
+    QCOMPARE(sCallbackCalls, 2);
 
     QTemporaryDir dir;
     // The account must be able to create files in the folder.
