@@ -4,73 +4,19 @@
 #include "zubase/ZuApplication.h"
 #include "zubase/ZuDesktop.h"
 
-#include <QDir>
-#include <QFileInfo>
-#include <QProcess>
+#include "helpers/XvfbServer.h"
+
 #include <QScreen>
-#include <QStandardPaths>
 #include <QX11Info>
 #include <QtTest>
 
 #include <dlfcn.h>
-#include <unistd.h>
 
 #include <X11/Xlib.h>
 
 namespace {
-
-QProcess* sServer = nullptr;
 QString sSkipReason;
-
-// Starts Xvfb on a free display number; false (and a reason) when it cannot.
-bool startServer()
-{
-    const QString xvfb = QStandardPaths::findExecutable(QStringLiteral("Xvfb"));
-    if (xvfb.isEmpty()) {
-        sSkipReason = QStringLiteral("Xvfb is not installed");
-        return false;
-    }
-    for (int display = 100 + int(getpid() % 300); display < 1000; display += 7) {
-        const QString socket = QStringLiteral("/tmp/.X11-unix/X%1").arg(display);
-        if (QFileInfo::exists(socket) ||
-            QFileInfo::exists(QStringLiteral("/tmp/.X%1-lock").arg(display)))
-            continue;
-        sServer = new QProcess;
-        sServer->setProcessChannelMode(QProcess::ForwardedErrorChannel);
-        sServer->start(xvfb, {QStringLiteral(":%1").arg(display), QStringLiteral("-nolisten"),
-                              QStringLiteral("tcp"), QStringLiteral("-screen"), QStringLiteral("0"),
-                              QStringLiteral("1920x1200x24"), QStringLiteral("-screen"),
-                              QStringLiteral("1"), QStringLiteral("3840x1200x24"),
-                              QStringLiteral("-screen"), QStringLiteral("2"),
-                              QStringLiteral("2560x1080x24")});
-        if (!sServer->waitForStarted(5000))
-            break;
-        for (int i = 0; i < 100 && !QFileInfo::exists(socket); ++i) {
-            if (sServer->waitForFinished(50))
-                break;
-        }
-        if (QFileInfo::exists(socket) && sServer->state() == QProcess::Running) {
-            qputenv("DISPLAY", QByteArray(":") + QByteArray::number(display));
-            return true;
-        }
-        delete sServer;
-        sServer = nullptr;
-    }
-    sSkipReason = QStringLiteral("Xvfb did not start");
-    return false;
 }
-
-void stopServer()
-{
-    if (!sServer)
-        return;
-    sServer->terminate();
-    sServer->waitForFinished(5000);
-    delete sServer;
-    sServer = nullptr;
-}
-
-} // namespace
 
 class TestDesktopXvfb : public QObject
 {
@@ -143,22 +89,17 @@ void TestDesktopXvfb::mouseButtons2()
 
 int main(int argc, char** argv, char** envp)
 {
-    int result = 0;
-    if (startServer()) {
-        qputenv("QT_QPA_PLATFORM", "xcb");
-        ZuApplication* app = ZuApplication::createInstance(argc, argv, envp);
+    XvfbServer server({"1920x1200x24", "3840x1200x24", "2560x1080x24"});
+    sSkipReason = server.skipReason();
+    // Without a server the test case still runs, to report the skip.
+    qputenv("QT_QPA_PLATFORM", server.isRunning() ? "xcb" : "offscreen");
+    ZuApplication* app = ZuApplication::createInstance(argc, argv, envp);
+    int result = 1;
+    {
         TestDesktopXvfb test;
         result = QTest::qExec(&test, argc, argv);
-        delete app;
-    } else {
-        // Still report the skip through QtTest.
-        qputenv("QT_QPA_PLATFORM", "offscreen");
-        ZuApplication* app = ZuApplication::createInstance(argc, argv, envp);
-        TestDesktopXvfb test;
-        result = QTest::qExec(&test, argc, argv);
-        delete app;
     }
-    stopServer();
+    delete app;
     return result;
 }
 
