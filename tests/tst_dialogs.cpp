@@ -95,7 +95,6 @@ private slots:
     void movedByCaller();
     void execKeepsDialog_data();
     void execKeepsDialog();
-    void progressDialog();
     void colorAndFont();
     void inputNumbers();
     void inputItem_data();
@@ -263,17 +262,6 @@ void TestDialogs::execKeepsDialog()
     QVERIFY(!dialog->testAttribute(Qt::WA_DeleteOnClose));
     QVERIFY(!dialog->testAttribute(Qt::WA_ShowModal));
     delete dialog;
-}
-
-void TestDialogs::progressDialog()
-{
-    ZuProgressDialog dialog(QStringLiteral("Copying"), QStringLiteral("Stop"), 5, 50);
-    QCOMPARE(dialog.parentWidget(), mMain.get());
-    QCOMPARE(dialog.labelText(), QStringLiteral("Copying"));
-    QCOMPARE(dialog.minimum(), 5);
-    QCOMPARE(dialog.maximum(), 50);
-    QVERIFY(dialog.findChild<QPushButton*>());
-    QCOMPARE(dialog.findChild<QPushButton*>()->text(), QStringLiteral("Stop"));
 }
 
 void TestDialogs::colorAndFont()
