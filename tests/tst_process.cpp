@@ -613,6 +613,14 @@ void TestProcess::elevatedStart()
         QVERIFY(failureLines(capture).isEmpty());
         QTest::qWait(250);
         QCOMPARE(spy.count(), 0); // an elevated child is not watched
+        // The fixed id names no process, even where the system has one of that number.
+        capture.clear();
+        QVERIFY(!process.isRunning());
+        QCOMPARE(process.wait(), -1);
+        QVERIFY(process.terminate(1).isBad());
+        QCOMPARE(failureLines(capture),
+                 QStringList({sWhere + "terminate: ::OpenProcess  cond[hProcess!=0]",
+                              "last error 3: No such process"}));
     } else {
         QCOMPARE(process.processId(), 0u);
         QCOMPARE(failureLines(capture),

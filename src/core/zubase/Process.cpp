@@ -13,6 +13,7 @@
 #include <QSet>
 #include <QTimer>
 
+#include <cerrno>
 #include <cstdio>
 #include <unistd.h>
 
@@ -103,6 +104,7 @@ RkResult Process::start(bool inElevate, bool inInheritEnvironment, bool)
     mProcessInformation = ProcessInformation();
     mStartupInformation = StartupInformation();
     mTerminatedEmitted = false;
+    mPlaceholderId = false;
 
     const QByteArray quotedExe = ProcessText::quotedExecutable(mExePath);
     const QByteArray arguments = ProcessText::argumentString(mArguments);
@@ -147,6 +149,7 @@ RkResult Process::start(bool inElevate, bool inInheritEnvironment, bool)
             return res;
         }
         mProcessId = sFakeElevatedProcessId;
+        mPlaceholderId = true;
         return res;
     }
 
@@ -201,7 +204,7 @@ bool Process::isRunning()
     if (mProcessId == 0)
         return false;
     ZuPlatform::Handle process = 0;
-    if (ZuPlatform::openProcess(mProcessId, true, process) != 0)
+    if (openWatched(true, process) != 0)
         return false;
     bool running = false;
     int code = 0;
@@ -243,7 +246,7 @@ RkResult Process::terminate(int inExitCode)
         return res;
     }
     ZuPlatform::Handle hProcess = 0;
-    int error = ZuPlatform::openProcess(mProcessId, true, hProcess);
+    int error = openWatched(true, hProcess);
     if (Tz::failWin(RK_CHECK(hProcess != 0, "hProcess!=0", "::OpenProcess"), error)) {
         res.makeBad(1);
         return res;
@@ -254,6 +257,17 @@ RkResult Process::terminate(int inExitCode)
         res.makeBad(1);
     ZuPlatform::closeHandle(hProcess);
     return res;
+}
+
+int Process::openWatched(bool inFullAccess, std::intptr_t& outHandle) const
+{
+    // The id left by an elevated start names no process here (on Windows it cannot be a
+    // process id at all); a process that happens to have it must not be touched.
+    if (mPlaceholderId) {
+        outHandle = 0;
+        return ESRCH;
+    }
+    return ZuPlatform::openProcess(mProcessId, inFullAccess, outHandle);
 }
 
 void Process::detach()
@@ -279,7 +293,7 @@ RkResult Process::imageFilePath(QString& outPath)
     RkResult res;
     outPath.clear();
     ZuPlatform::Handle process = 0;
-    if (ZuPlatform::openProcess(mProcessId, false, process) != 0) {
+    if (openWatched(false, process) != 0) {
         res.makeBad(1);
         return res;
     }
@@ -299,7 +313,7 @@ RkResult Process::modules(QStringList& outPaths)
     RkResult res;
     outPaths.clear();
     ZuPlatform::Handle process = 0;
-    if (ZuPlatform::openProcess(mProcessId, false, process) != 0) {
+    if (openWatched(false, process) != 0) {
         res.makeBad(1);
         return res;
     }

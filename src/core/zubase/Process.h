@@ -111,6 +111,7 @@ public slots:
 
 private:
     void closeHandles();
+    int openWatched(bool inFullAccess, std::intptr_t& outHandle) const;
 
     ProcessInformation mProcessInformation;
     StartupInformation mStartupInformation;
@@ -118,6 +119,7 @@ private:
     int mExitCode = -1;
     bool mPollArmed = false;
     bool mTerminatedEmitted = false;
+    bool mPlaceholderId = false; // the process id is the fixed one of an elevated start
 
     static void (*sExitCallback)(int, QString);
 };
