@@ -74,6 +74,7 @@ private slots:
     void clientReadsFromServerProcess();
     void clientFirstCountsAsConnected();
     void acceptTimesOutWithoutClient();
+    void secondClientFindsPipeBusy();
     void clientWaitsForServer();
     void noSuchPipe();
     void clientEndIsReadOnly();
@@ -204,6 +205,31 @@ void TestPipe::acceptTimesOutWithoutClient()
     char got = 0;
     QVERIFY(client.read(&got, 1).isOk());
     QCOMPARE(got, 'x');
+}
+
+void TestPipe::secondClientFindsPipeBusy()
+{
+    const QString name = uniqueName();
+    ZuBase::Pipe server(true);
+    server.nameSet(name);
+    QVERIFY(server.createOnServer().isOk());
+    ZuBase::Pipe first(false);
+    first.nameSet(name);
+    QVERIFY(first.connectOnClient().isOk());
+    QVERIFY(server.acceptOnServer().isOk());
+    // One instance: a second client is refused with a record, and the first is undisturbed.
+    RkLogCapture capture;
+    ZuBase::Pipe second(false);
+    second.nameSet(name);
+    QVERIFY(second.connectOnClient().isBad());
+    QVERIFY(!second.isConnected());
+    QCOMPARE(failureLines(capture),
+             QStringList({sWhere + "connectOnClient: ::CreateFile  val[-1]  notexp[-1]",
+                          "last error 16: Device or resource busy"}));
+    QVERIFY(server.write("z", 1).isOk());
+    char got = 0;
+    QVERIFY(first.read(&got, 1).isOk());
+    QCOMPARE(got, 'z');
 }
 
 void TestPipe::clientWaitsForServer()

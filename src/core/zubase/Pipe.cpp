@@ -113,6 +113,7 @@ RkResult Pipe::acceptOnServer()
 RkResult Pipe::connectOnClient()
 {
     RkResult res;
+    close(); // as for createOnServer: an earlier handle would leak
     const std::string name = systemName(mName);
     ZuPlatform::waitNamedPipe(name, sConnectTimeout); // only gives the server time to appear
     ZuPlatform::PipeHandle opened = ZuPlatform::InvalidPipe;
