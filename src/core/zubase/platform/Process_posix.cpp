@@ -402,14 +402,17 @@ int createProcessSuspended(const std::string& inCommandLine, const char* inEnvir
     do {
         got = waitpid(pid, &status, WUNTRACED);
     } while (got < 0 && errno == EINTR);
-    if (got != pid || !WIFSTOPPED(status)) {
+    if (got != pid) {
+        // Its stop cannot be seen (the host collects children itself): do not leave it.
+        const int error = errno;
+        kill(pid, SIGKILL);
+        close(errorPipe[0]);
+        return error;
+    }
+    if (!WIFSTOPPED(status)) {
+        // It ended before the stop; the pipe tells why.
         const int error = readError(errorPipe[0]);
         close(errorPipe[0]);
-        if (got == pid && WIFSTOPPED(status)) {
-            // Stopped by somebody else before reaching our stop: let it go.
-            kill(pid, SIGKILL);
-            waitpid(pid, &status, 0);
-        }
         return error ? error : ECHILD;
     }
     close(errorPipe[0]);
