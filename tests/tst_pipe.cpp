@@ -357,6 +357,12 @@ void TestPipe::serverDiesWhileClientReads()
     QCOMPARE(failureLines(capture),
              QStringList({sWhere + "read: ::ReadFile  cond[b]", "last error 32: Broken pipe"}));
     QVERIFY(server.waitForFinished(5000));
+    // The dead server's socket is taken over and removed by the next one.
+    ZuBase::Pipe next(true);
+    next.nameSet(name);
+    QVERIFY(next.createOnServer().isOk());
+    next.close();
+    QVERIFY(!QFile::exists(socketPath(name)));
 }
 
 void TestPipe::foreignPeerReadsStream()
