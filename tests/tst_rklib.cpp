@@ -1,5 +1,4 @@
 // The core runtime layer: failure records, the log, handles, arrays, versions, file names.
-#include "rklib/DvParameter.h"
 #include "rklib/RkCheck.h"
 #include "rklib/RkDArray.h"
 #include "rklib/RkFilename.h"
@@ -91,7 +90,6 @@ private slots:
     void filenameHelpers();
     void filenameExistsAndRename();
     void threadWaitTimesOut();
-    void paramBundle();
 };
 
 void TestRkLib::checkRecords_data()
@@ -546,19 +544,6 @@ void TestRkLib::threadWaitTimesOut()
     QVERIFY(looper.passes > 0);
 }
 
-void TestRkLib::paramBundle()
-{
-    DvParamBundle bundle;
-    bundle.add(std::make_unique<DvParameter>("OtherVersion", "C:/x"));
-    bundle.add(nullptr);
-    QCOMPARE(bundle.size(), 1);
-    auto* parameter = dynamic_cast<DvParameter*>(bundle[0]);
-    QVERIFY(parameter);
-    QCOMPARE(parameter->getName(), RkString("OtherVersion"));
-    QCOMPARE(parameter->getString(), RkString("C:/x"));
-    QVERIFY(bundle[1] == nullptr);
-    QVERIFY(bundle[-1] == nullptr);
-}
 
 QTEST_GUILESS_MAIN(TestRkLib)
 #include "tst_rklib.moc"

@@ -1,14 +1,18 @@
 // The demo host: registers its commands, parses the command line through ZuBase::Command and
 // shows the main window. Without a display it renders the window offscreen to a PNG file.
 #include "DemoCommands.h"
+#include "DemoDialogsPage.h"
 #include "DemoWindow.h"
 
-#include <QApplication>
+#include "zubase/ZuApplication.h"
+
 #include <QDir>
+#include <QTabWidget>
 #include <QTimer>
 
 #include <cstdio>
 #include <cstdlib>
+#include <memory>
 
 namespace {
 
@@ -27,19 +31,33 @@ template <typename T> bool hasCommand(const RkDArray<RkHandle<ZuBase::Command>>&
     return false;
 }
 
+// Parentless dialogs of the library go to the main window.
+class MainWindowProvider : public ZuApplication::DefaultParentProvider
+{
+public:
+    explicit MainWindowProvider(QWidget* inWindow) : mWindow(inWindow) {}
+    QWidget* defaultParent() const override { return mWindow; }
+
+private:
+    QWidget* mWindow;
+};
+
 } // namespace
 
-int main(int argc, char** argv)
+int main(int argc, char** argv, char** envp)
 {
     const bool headless = !hasDisplay() && qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM");
     if (headless)
         qputenv("QT_QPA_PLATFORM", "offscreen");
 
     DemoCommands::registerAll();
-    QApplication app(argc, argv);
+    // Owned here so that it outlives the window and is destroyed at the end.
+    const std::unique_ptr<ZuApplication> app(ZuApplication::createInstance(argc, argv, envp));
+    if (!app)
+        return 1;
 
     RkDArray<RkHandle<ZuBase::Command>> commands;
-    const RkResult parsed = ZuBase::Command::parseCommands(app.arguments().mid(1), commands);
+    const RkResult parsed = ZuBase::Command::parseCommands(app->arguments().mid(1), commands);
     if (parsed.isBad()) {
         ZuBase::Command::usage(QString(), true);
         return 2;
@@ -50,6 +68,9 @@ int main(int argc, char** argv)
     }
 
     DemoWindow window;
+    app->setDefaultParentProvider(new MainWindowProvider(&window));
+    if (auto* tabs = qobject_cast<QTabWidget*>(window.centralWidget()))
+        tabs->addTab(new DemoDialogsPage(tabs), QObject::tr("Dialogs"));
     QString screenshot;
     for (const auto& command : commands) {
         if (auto* shot = dynamic_cast<ScreenshotCommand*>(command.get())) {
@@ -74,6 +95,6 @@ int main(int argc, char** argv)
 
     window.show();
     if (hasCommand<QuitCommand>(commands))
-        QTimer::singleShot(0, &app, &QApplication::quit);
-    return app.exec();
+        QTimer::singleShot(0, app.get(), &QApplication::quit);
+    return QApplication::exec();
 }

@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <ctime>
 #include <map>
+#include <shared_mutex>
 #include <sys/syscall.h>
 #include <unistd.h>
 
@@ -45,6 +46,9 @@ struct RkLogFile::Private
     RkLogLevel outputLevel = RkLogInfo;
 
     std::mutex sinkMutex;
+    // Held shared while sinks run, exclusively by removeSink(), so that a removed sink is
+    // never called again once removeSink() has returned.
+    std::shared_mutex sinkCallMutex;
     std::map<int, std::shared_ptr<Sink>> sinks;
     int nextSinkId = 1;
     WriteCallback callback = nullptr;
@@ -121,19 +125,22 @@ void RkLogFile::write(RkLogLevel inLevel, const char* inCategory, const std::str
         std::fflush(d->output);
     }
 
-    // Sinks and the callback run outside the lock so that they may log themselves.
-    std::vector<std::shared_ptr<Sink>> sinks;
+    // The callback runs outside every lock so that it may log itself.
     WriteCallback callback = nullptr;
     {
-        std::lock_guard<std::mutex> lock(d->sinkMutex);
-        sinks.reserve(d->sinks.size());
-        for (const auto& sink : d->sinks)
-            sinks.push_back(sink.second);
-        if (inLevel >= d->callbackLevel && tCallbackDisabled == 0)
-            callback = d->callback;
+        std::shared_lock<std::shared_mutex> calling(d->sinkCallMutex);
+        std::vector<std::shared_ptr<Sink>> sinks;
+        {
+            std::lock_guard<std::mutex> lock(d->sinkMutex);
+            sinks.reserve(d->sinks.size());
+            for (const auto& sink : d->sinks)
+                sinks.push_back(sink.second);
+            if (inLevel >= d->callbackLevel && tCallbackDisabled == 0)
+                callback = d->callback;
+        }
+        for (const auto& sink : sinks)
+            (*sink)(entry);
     }
-    for (const auto& sink : sinks)
-        (*sink)(entry);
     if (callback)
         callback(inLevel, RkString(entry.text));
 }
@@ -182,8 +189,12 @@ int RkLogFile::addSink(Sink inSink)
 
 void RkLogFile::removeSink(int inId)
 {
-    std::lock_guard<std::mutex> lock(d->sinkMutex);
-    d->sinks.erase(inId);
+    {
+        std::lock_guard<std::mutex> lock(d->sinkMutex);
+        d->sinks.erase(inId);
+    }
+    // Wait for calls that picked the sink up before it was erased.
+    std::unique_lock<std::shared_mutex> drained(d->sinkCallMutex);
 }
 
 std::string RkLogFile::formatLine(const RkLogEntry& inEntry)

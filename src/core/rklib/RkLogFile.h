@@ -69,6 +69,8 @@ public:
     // Redirects the output to a file (appending); an empty path means stderr.
     bool setOutputFile(const std::string& inPath);
 
+    // Sinks see every line; they must not log themselves. Once removeSink() has returned,
+    // the sink is not called any more.
     int addSink(Sink inSink);
     void removeSink(int inId);
 

@@ -20,46 +20,98 @@
 
 #ifdef Q_OS_UNIX
 #include <pthread.h>
+#include <sys/mman.h>
+#include <unistd.h>
 #endif
 
 namespace {
 
-// Receivers of the notify() calls active on the main thread, outermost first. A plain array
-// so that the dispatch fast path is a store and an increment; it only grows.
+// Receivers of the notify() calls active on the main thread, outermost first.
+//
+// notify() runs for every event, so its push must be a store and an increment. Where the system
+// lets us, the array is one reservation of address space for kReserved entries whose pages are
+// only backed by memory once touched, followed by an inaccessible guard page: it grows without
+// ever moving or being checked on the fast path. No thread's own stack can hold the frames of
+// a million nested dispatches, so the guard page is never reached before the thread's stack
+// would overflow. Elsewhere it is an ordinary array that doubles when full.
 struct NotifyStack
 {
-    QObject** data = nullptr;
-    int size = 0;
-    int capacity = 0;
+    QObject** base = nullptr;
+    QObject** top = nullptr;
+    QObject** end = nullptr;
+    bool reserved = false;
 
+    int size() const { return int(top - base); }
     void push(QObject* inObject)
     {
-        if (Q_UNLIKELY(size == capacity))
+        if (Q_UNLIKELY(top == end))
             grow();
-        data[size++] = inObject;
+        *top++ = inObject;
     }
-    void grow()
-    {
-        const int newCapacity = capacity ? capacity * 2 : 64;
-        auto* newData = static_cast<QObject**>(std::realloc(data, sizeof(QObject*) * newCapacity));
-        Q_CHECK_PTR(newData);
-        data = newData;
-        capacity = newCapacity;
-    }
+    void grow();
 };
+
+#if defined(Q_OS_UNIX)
+const size_t kReserved = size_t(1) << 20;
+#endif
+
+void NotifyStack::grow()
+{
+    const int used = size();
+#if defined(Q_OS_UNIX)
+    if (!base) {
+        const size_t page = size_t(sysconf(_SC_PAGESIZE));
+        const size_t bytes = kReserved * sizeof(QObject*);
+        void* memory = mmap(nullptr, bytes + page, PROT_READ | PROT_WRITE,
+                            MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
+        if (memory != MAP_FAILED) {
+            mprotect(static_cast<char*>(memory) + bytes, page, PROT_NONE);
+            base = top = static_cast<QObject**>(memory);
+            end = base + kReserved;
+            reserved = true;
+            return;
+        }
+    }
+    if (reserved)
+        qFatal("ZuApplication: event dispatch nested more than %d levels", used);
+#endif
+    const int capacity = base ? int(end - base) * 2 : 64;
+    auto* data = static_cast<QObject**>(std::realloc(base, sizeof(QObject*) * size_t(capacity)));
+    Q_CHECK_PTR(data);
+    base = data;
+    top = data + used;
+    end = data + capacity;
+}
 
 NotifyStack sNotifyStack;
 Qt::HANDLE sMainThreadId = nullptr;
-ZuApplication::HookNotify* sHooks[3] = {nullptr, nullptr, nullptr};
-// Any slot filled: one test instead of three on the path of every event.
-bool sAnyHook = false;
+// An empty slot holds this do-nothing hook instead of null, so that the dispatch calls every
+// slot without testing it; to the callers of install and de-install the slot is empty.
+class EmptyHook final : public ZuApplication::HookNotify
+{
+public:
+    void beforeNotify(QObject*, QEvent*) override {}
+    void afterNotify(QObject*, QEvent*) override {}
+};
+EmptyHook sEmptyHook;
+ZuApplication::HookNotify* sHooks[3] = {&sEmptyHook, &sEmptyHook, &sEmptyHook};
+// The main thread's id while no hook is installed, else null: one comparison in notify()
+// tells both.
+Qt::HANDLE sFastPathThreadId = nullptr;
+// The main thread's id while hooks are installed (and the stack needs no capacity check).
+Qt::HANDLE sHookedPathThreadId = nullptr;
 int sDeferredDeleteReports = 0;
 const int sMaxDeferredDeleteReports = 5000;
 
 inline Qt::HANDLE currentThreadHandle()
 {
-#ifdef Q_OS_UNIX
-    // What QThread::currentThreadId() returns here, without the detour through QtCore.
+#if defined(Q_OS_LINUX) && defined(Q_PROCESSOR_X86_64) && defined(__GLIBC__)
+    // The thread's control block pointer, which is what pthread_self() and so
+    // QThread::currentThreadId() return, read without a call: notify() asks for every event.
+    Qt::HANDLE self;
+    __asm__("movq %%fs:0, %0" : "=r"(self));
+    return self;
+#elif defined(Q_OS_UNIX)
     return reinterpret_cast<Qt::HANDLE>(pthread_self());
 #else
     return QThread::currentThreadId();
@@ -71,26 +123,21 @@ inline bool onMainThread()
     return !sMainThreadId || currentThreadHandle() == sMainThreadId;
 }
 
-void updateAnyHook()
+void updateFastPath()
 {
-    sAnyHook = sHooks[0] || sHooks[1] || sHooks[2];
+    const bool anyHook =
+        sHooks[0] != &sEmptyHook || sHooks[1] != &sEmptyHook || sHooks[2] != &sEmptyHook;
+    // Without the reserved stack the push needs its capacity check: full path only.
+    sFastPathThreadId = (anyHook || !sNotifyStack.reserved) ? nullptr : sMainThreadId;
+    sHookedPathThreadId = (anyHook && sNotifyStack.reserved) ? sMainThreadId : nullptr;
 }
 
-Q_NEVER_INLINE void callBeforeHooks(QObject* inReceiver, QEvent* inEvent)
+// Wheel events and deferred deletions need the full dispatch. One bit test on the type modulo
+// 64; the few other types that share those bits merely take the full path too.
+inline bool isSpecialEventType(QEvent::Type inType)
 {
-    // The table is read afresh for every slot: a hook may remove itself or another one.
-    for (int i = 0; i < 3; ++i) {
-        if (ZuApplication::HookNotify* hook = sHooks[i])
-            hook->beforeNotify(inReceiver, inEvent);
-    }
-}
-
-Q_NEVER_INLINE void callAfterHooks(QObject* inReceiver, QEvent* inEvent)
-{
-    for (int i = 2; i >= 0; --i) {
-        if (ZuApplication::HookNotify* hook = sHooks[i])
-            hook->afterNotify(inReceiver, inEvent);
-    }
+    const quint64 special = (quint64(1) << QEvent::Wheel) | (quint64(1) << QEvent::DeferredDelete);
+    return (special >> (unsigned(inType) & 63)) & 1;
 }
 
 // QObject keeps a "deleteLater() was called" flag and drops a further deferred delete while
@@ -110,14 +157,15 @@ struct DeleteLaterFlag : QObject
 // is looked up in a sorted copy of the stack, so the cost is linear in the size of the tree.
 Q_NEVER_INLINE bool deferredDeleteMustWait(QObject* inReceiver, QEvent* inEvent)
 {
-    if (sNotifyStack.size == 0)
+    const int depth = sNotifyStack.size();
+    if (depth == 0)
         return false;
 
     // (object, lowest stack index), sorted by object and then index.
     std::vector<std::pair<QObject*, int>> active;
-    active.reserve(static_cast<size_t>(sNotifyStack.size));
-    for (int i = 0; i < sNotifyStack.size; ++i)
-        active.emplace_back(sNotifyStack.data[i], i);
+    active.reserve(static_cast<size_t>(depth));
+    for (int i = 0; i < depth; ++i)
+        active.emplace_back(sNotifyStack.base[i], i);
     std::sort(active.begin(), active.end());
 
     auto levelOf = [&active](QObject* inObject) {
@@ -151,8 +199,8 @@ Q_NEVER_INLINE bool deferredDeleteMustWait(QObject* inReceiver, QEvent* inEvent)
             "deletion of [0x%" PRIxPTR " %s] in level [%d] would also delete [0x%" PRIxPTR
             " %s] which is still processing an event in level [%d]",
             reinterpret_cast<uintptr_t>(inReceiver), Q2M(inReceiver->objectName()).constData(),
-            sNotifyStack.size, reinterpret_cast<uintptr_t>(found),
-            Q2M(found->objectName()).constData(), foundLevel);
+            depth, reinterpret_cast<uintptr_t>(found), Q2M(found->objectName()).constData(),
+            foundLevel);
         ++sDeferredDeleteReports;
     }
     inEvent->accept();
@@ -168,9 +216,56 @@ struct NotifyStackPop
     ~NotifyStackPop()
     {
         if (active)
-            --sNotifyStack.size;
+            --sNotifyStack.top;
     }
 };
+
+// Main thread, ordinary event, hooks installed: the common case with hooks, kept to the push,
+// the six hook calls, the dispatch and the pop.
+Q_NEVER_INLINE bool notifyHooked(ZuApplication* inApp, QObject* inReceiver, QEvent* inEvent)
+{
+    *sNotifyStack.top++ = inReceiver;
+    NotifyStackPop pop{true};
+    // The table is read afresh for every slot: a hook may remove itself or another one.
+    sHooks[0]->beforeNotify(inReceiver, inEvent);
+    sHooks[1]->beforeNotify(inReceiver, inEvent);
+    sHooks[2]->beforeNotify(inReceiver, inEvent);
+    const bool result = inApp->QApplication::notify(inReceiver, inEvent);
+    sHooks[2]->afterNotify(inReceiver, inEvent);
+    sHooks[1]->afterNotify(inReceiver, inEvent);
+    sHooks[0]->afterNotify(inReceiver, inEvent);
+    return result;
+}
+
+// Every step of the dispatch, for the events the fast path in ZuApplication::notify() leaves.
+Q_NEVER_INLINE bool notifyFull(ZuApplication* inApp, QObject* inReceiver, QEvent* inEvent)
+{
+    const QEvent::Type type = inEvent->type();
+    const bool mainThread = onMainThread();
+    if (mainThread) {
+        if (type == QEvent::DeferredDelete && deferredDeleteMustWait(inReceiver, inEvent))
+            return true;
+        sNotifyStack.push(inReceiver);
+    }
+    NotifyStackPop pop{mainThread};
+
+    // The table is read afresh for every slot: a hook may remove itself or another one.
+    sHooks[0]->beforeNotify(inReceiver, inEvent);
+    sHooks[1]->beforeNotify(inReceiver, inEvent);
+    sHooks[2]->beforeNotify(inReceiver, inEvent);
+
+    QObject* target = inReceiver;
+    if (type == QEvent::Wheel) {
+        if (QObject* grabber = ZuWheelGrabber::grabObject())
+            target = grabber;
+    }
+    const bool result = inApp->QApplication::notify(target, inEvent);
+
+    sHooks[2]->afterNotify(inReceiver, inEvent);
+    sHooks[1]->afterNotify(inReceiver, inEvent);
+    sHooks[0]->afterNotify(inReceiver, inEvent);
+    return result;
+}
 
 } // namespace
 
@@ -223,8 +318,10 @@ ZuApplication::ZuApplication(int& argc, char** argv, char** envp)
     : QApplication(argc, argv), mAboutAction(this)
 {
     sMainThreadId = currentThreadHandle();
-    if (sNotifyStack.capacity == 0)
+    Q_ASSERT(sMainThreadId == QThread::currentThreadId());
+    if (!sNotifyStack.base)
         sNotifyStack.grow();
+    updateFastPath();
 
     if (envp && envp[0]) {
         for (char** entry = envp; *entry; ++entry) {
@@ -248,34 +345,26 @@ bool ZuApplication::isMainThread()
 
 int ZuApplication::callDepth_of_notify()
 {
-    return sNotifyStack.size;
+    return sNotifyStack.size();
 }
 
 bool ZuApplication::notify(QObject* inReceiver, QEvent* inEvent)
 {
-    const QEvent::Type type = inEvent->type();
-    const bool mainThread = onMainThread();
-    if (mainThread) {
-        if (Q_UNLIKELY(type == QEvent::DeferredDelete) &&
-            deferredDeleteMustWait(inReceiver, inEvent))
-            return true;
-        sNotifyStack.push(inReceiver);
+    // Fast path for nearly every event: an ordinary event type, the main thread and no hook
+    // installed (sFastPathThreadId is the main thread's id only while no hook is installed).
+    // Nothing but the stack stays alive across the dispatch, so it costs a handful of
+    // instructions. Everything else takes the full dispatch.
+    if (Q_LIKELY(!isSpecialEventType(inEvent->type()))) {
+        const Qt::HANDLE self = currentThreadHandle();
+        if (Q_LIKELY(self == sFastPathThreadId)) {
+            *sNotifyStack.top++ = inReceiver;
+            NotifyStackPop pop{true};
+            return QApplication::notify(inReceiver, inEvent);
+        }
+        if (self == sHookedPathThreadId)
+            return notifyHooked(this, inReceiver, inEvent);
     }
-    NotifyStackPop pop{mainThread};
-
-    if (Q_UNLIKELY(sAnyHook))
-        callBeforeHooks(inReceiver, inEvent);
-
-    QObject* target = inReceiver;
-    if (Q_UNLIKELY(type == QEvent::Wheel)) {
-        if (QObject* grabber = ZuWheelGrabber::grabObject())
-            target = grabber;
-    }
-    const bool result = n_______________________________________(target, inEvent);
-
-    if (Q_UNLIKELY(sAnyHook))
-        callAfterHooks(inReceiver, inEvent);
-    return result;
+    return notifyFull(this, inReceiver, inEvent);
 }
 
 bool ZuApplication::n_______________________________________(QObject* inReceiver, QEvent* inEvent)
@@ -297,12 +386,12 @@ void ZuApplication::installHookNotify(HookNotify* inHook)
             return;
     }
     for (HookNotify*& slot : sHooks) {
-        if (!slot) {
+        if (slot == &sEmptyHook) {
             slot = inHook;
             break;
         }
     }
-    updateAnyHook();
+    updateFastPath();
 }
 
 void ZuApplication::deInstallHookNotify(HookNotify* inHook)
@@ -311,11 +400,11 @@ void ZuApplication::deInstallHookNotify(HookNotify* inHook)
         return;
     for (HookNotify*& slot : sHooks) {
         if (slot == inHook) {
-            slot = nullptr;
+            slot = &sEmptyHook;
             break;
         }
     }
-    updateAnyHook();
+    updateFastPath();
 }
 
 const ZuApplication::DefaultParentProvider& ZuApplication::defaultParentProvider()

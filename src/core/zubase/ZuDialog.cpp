@@ -1,0 +1,5 @@
+#include "zubase/ZuDialog.h"
+
+ZuDialog::ZuDialog(QWidget* inParent) : ZuTopLevelWidgetWrapper<QDialog>(inParent) {}
+
+ZuDialog::~ZuDialog() = default;
