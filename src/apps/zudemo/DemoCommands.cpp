@@ -7,6 +7,7 @@ void registerAll()
     ZuBase::Command::registerFactory(QStringLiteral("help"), &HelpCommand::make);
     ZuBase::Command::registerFactory(QStringLiteral("screenshot"), &ScreenshotCommand::make);
     ZuBase::Command::registerFactory(QStringLiteral("quit"), &QuitCommand::make);
+    ZuBase::Command::registerFactory(QStringLiteral("scheme"), &SchemeCommand::make);
 }
 
 } // namespace DemoCommands
@@ -69,4 +70,26 @@ const char* QuitCommand::description() const
 const char* QuitCommand::detailedDescription() const
 {
     return "    (no attributes)\n";
+}
+
+RkHandle<ZuBase::Command> SchemeCommand::make()
+{
+    return new SchemeCommand;
+}
+
+const char* SchemeCommand::description() const
+{
+    return "Starts with the given colour scheme.";
+}
+
+const char* SchemeCommand::detailedDescription() const
+{
+    return "    name=NAME      the scheme's name, e.g. \"Tessel Dark\" (required)\n";
+}
+
+QString SchemeCommand::schemeName(RkResult& outResult) const
+{
+    RkHandle<Attribute> name;
+    outResult = attribute1(name, QStringLiteral("name"), true);
+    return name.isNotNull() ? name->value() : QString();
 }

@@ -2,7 +2,8 @@
 
 #include "zubase/Command.h"
 
-// The demo host's commands: --help [command=NAME], --screenshot file=PATH, --quit.
+// The demo host's commands: --help [command=NAME], --scheme name=NAME, --screenshot file=PATH,
+// --quit.
 namespace DemoCommands {
 
 // Registers the commands with ZuBase::Command.
@@ -43,4 +44,17 @@ public:
     const char* description() const override;
     const char* detailedDescription() const override;
     RkResult finish() override { return RkResult(); }
+};
+
+// --scheme name=NAME: the colour scheme to start with (default "Tessel Light").
+class SchemeCommand : public ZuBase::Command
+{
+public:
+    static RkHandle<ZuBase::Command> make();
+    RkResult execute() override { return RkResult(); }
+    const char* description() const override;
+    const char* detailedDescription() const override;
+    RkResult finish() override { return RkResult(); }
+    // The scheme named by the "name" attribute.
+    QString schemeName(RkResult& outResult) const;
 };

@@ -1,5 +1,6 @@
 #include "DemoWindow.h"
 
+#include "DemoDialogsPage.h"
 #include "DemoSchemePage.h"
 
 #include "zubase/Command.h"
@@ -15,6 +16,9 @@ DemoWindow::DemoWindow(QWidget* inParent) : QMainWindow(inParent)
     setWindowTitle(tr("zubase demo"));
     auto* tabs = new QTabWidget(this);
 
+    tabs->addTab(new DemoSchemePage(tabs), tr("Colour schemes"));
+    tabs->addTab(new DemoDialogsPage(tabs), tr("Dialogs"));
+
     auto* usagePage = new QWidget(tabs);
     auto* usageLayout = new QVBoxLayout(usagePage);
     usageLayout->addWidget(new QLabel(tr("Command line of this host:"), usagePage));
@@ -23,10 +27,9 @@ DemoWindow::DemoWindow(QWidget* inParent) : QMainWindow(inParent)
     usage->setPlainText(ZuBase::Command::usage(QString(), false));
     usageLayout->addWidget(usage);
     tabs->addTab(usagePage, tr("Commands"));
-    tabs->addTab(new DemoSchemePage(tabs), tr("Colour schemes"));
 
     setCentralWidget(tabs);
-    resize(720, 520);
+    resize(960, 640);
 }
 
 bool DemoWindow::saveScreenshot(const QString& inPath)

@@ -1,17 +1,17 @@
-// The demo host: registers its commands, parses the command line through ZuBase::Command and
-// shows the main window. Without a display it renders the window offscreen to a PNG file.
+// The demo host: registers its commands, parses the command line through ZuBase::Command, applies
+// a colour scheme and shows the main window. Without a display it renders the window offscreen
+// to a PNG file and says where it wrote it.
 #include "DemoCommands.h"
-#include "DemoDialogsPage.h"
+#include "DemoSchemePage.h"
 #include "DemoWindow.h"
 
 #include "zubase/ZuApplication.h"
+#include "zubase/ZuStyleFactory.h"
 
 #include <QDir>
-#include <QTabWidget>
 #include <QTimer>
 
 #include <cstdio>
-#include <cstdlib>
 #include <memory>
 
 namespace {
@@ -22,13 +22,20 @@ bool hasDisplay()
            !qEnvironmentVariableIsEmpty("WAYLAND_DISPLAY");
 }
 
-template <typename T> bool hasCommand(const RkDArray<RkHandle<ZuBase::Command>>& inCommands)
+// Platforms that show nothing to a person.
+bool isHeadlessPlatform()
+{
+    const QString platform = QGuiApplication::platformName();
+    return platform == QLatin1String("offscreen") || platform == QLatin1String("minimal");
+}
+
+template <typename T> T* findCommand(const RkDArray<RkHandle<ZuBase::Command>>& inCommands)
 {
     for (const auto& command : inCommands) {
-        if (dynamic_cast<T*>(command.get()))
-            return true;
+        if (auto* found = dynamic_cast<T*>(command.get()))
+            return found;
     }
-    return false;
+    return nullptr;
 }
 
 // Parentless dialogs of the library go to the main window.
@@ -46,8 +53,7 @@ private:
 
 int main(int argc, char** argv, char** envp)
 {
-    const bool headless = !hasDisplay() && qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM");
-    if (headless)
+    if (!hasDisplay() && qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM"))
         qputenv("QT_QPA_PLATFORM", "offscreen");
 
     DemoCommands::registerAll();
@@ -55,30 +61,40 @@ int main(int argc, char** argv, char** envp)
     const std::unique_ptr<ZuApplication> app(ZuApplication::createInstance(argc, argv, envp));
     if (!app)
         return 1;
+    const bool headless = isHeadlessPlatform();
 
     RkDArray<RkHandle<ZuBase::Command>> commands;
-    const RkResult parsed = ZuBase::Command::parseCommands(app->arguments().mid(1), commands);
-    if (parsed.isBad()) {
+    if (ZuBase::Command::parseCommands(app->arguments().mid(1), commands).isBad()) {
         ZuBase::Command::usage(QString(), true);
         return 2;
     }
-    for (const auto& command : commands) {
-        if (auto* help = dynamic_cast<HelpCommand*>(command.get()))
-            return help->execute().isOk() ? 0 : 2;
+    if (HelpCommand* help = findCommand<HelpCommand>(commands))
+        return help->execute().isOk() ? 0 : 2;
+
+    QString scheme = QStringLiteral("Tessel Light");
+    if (const SchemeCommand* chosen = findCommand<SchemeCommand>(commands)) {
+        RkResult res;
+        scheme = chosen->schemeName(res);
+        if (res.isBad())
+            return 2;
+    }
+    DemoSchemePage::loadSchemes();
+    ZuStyleFactory::instance().setCurrentStyle(scheme);
+    if (ZuStyleFactory::instance().currentStyle() != scheme) {
+        std::fprintf(stderr, "zudemo: no colour scheme \"%s\" in %s\n", qPrintable(scheme),
+                     qPrintable(QDir::toNativeSeparators(DemoSchemePage::schemeFolder())));
+        return 2;
     }
 
     DemoWindow window;
     app->setDefaultParentProvider(new MainWindowProvider(&window));
-    if (auto* tabs = qobject_cast<QTabWidget*>(window.centralWidget()))
-        tabs->addTab(new DemoDialogsPage(tabs), QObject::tr("Dialogs"));
+
     QString screenshot;
-    for (const auto& command : commands) {
-        if (auto* shot = dynamic_cast<ScreenshotCommand*>(command.get())) {
-            RkResult res;
-            screenshot = shot->fileName(res);
-            if (res.isBad())
-                return 2;
-        }
+    if (const ScreenshotCommand* shot = findCommand<ScreenshotCommand>(commands)) {
+        RkResult res;
+        screenshot = shot->fileName(res);
+        if (res.isBad())
+            return 2;
     }
     if (screenshot.isEmpty() && headless)
         screenshot = QDir::temp().filePath(QStringLiteral("zudemo.png"));
@@ -88,13 +104,14 @@ int main(int argc, char** argv, char** envp)
             std::fprintf(stderr, "zudemo: could not write %s\n", qPrintable(screenshot));
             return 1;
         }
-        std::printf("zudemo: %swrote the main window to %s\n", headless ? "no display; " : "",
+        std::printf("zudemo: %swrote the main window in the scheme \"%s\" to %s\n",
+                    headless ? "no display; " : "", qPrintable(scheme),
                     qPrintable(QDir::toNativeSeparators(screenshot)));
         return 0;
     }
 
     window.show();
-    if (hasCommand<QuitCommand>(commands))
+    if (findCommand<QuitCommand>(commands))
         QTimer::singleShot(0, app.get(), &QApplication::quit);
     return QApplication::exec();
 }
