@@ -132,57 +132,52 @@ void TestXml::builder()
 }
 
 // Attributes are written with a blank before them, so an aligned one has a blank more than the
-// line break. Steps of a writer script: "S name" start, "X name" aligned start, "A name=value"
-// attribute, "E" end, "C text" section comment, "L" empty line, "Y" aligned empty line, "I n"
-// indent, "T text" characters.
+// line break. Steps of a writer script, split at "|": "S name" start, "X name" aligned start, "A
+// name=value" attribute, "E" end, "C text" section comment, "L" empty line, "Y" aligned empty line,
+// "I n" indent, "T text" characters.
 void TestXml::writerLayout_data()
 {
     QTest::addColumn<bool>("autoFormat");
-    QTest::addColumn<QStringList>("script");
+    QTest::addColumn<QString>("script");
     QTest::addColumn<QString>("expected"); // what follows the XML declaration
-    QTest::newRow("aligned root") << true << QStringList{"X Root", "A a=1", "A bb=2", "A c=3", "E"}
-                                  << "\n<Root a=\"1\"\n      bb=\"2\"\n      c=\"3\"/>\n";
-    QTest::newRow("plain start keeps one line")
-        << true << QStringList{"S Root", "A a=1", "A bb=2", "A c=3", "E"}
-        << "\n<Root a=\"1\" bb=\"2\" c=\"3\"/>\n";
+    auto row = [](const char* inName, bool inAutoFormat, const QString& inScript,
+                  const QString& inExpected) {
+        QTest::newRow(inName) << inAutoFormat << inScript << inExpected;
+    };
+    row("aligned root", true, "X Root|A a=1|A bb=2|A c=3|E",
+        "\n<Root a=\"1\"\n      bb=\"2\"\n      c=\"3\"/>\n");
+    row("plain start keeps one line", true, "S Root|A a=1|A bb=2|A c=3|E",
+        "\n<Root a=\"1\" bb=\"2\" c=\"3\"/>\n");
     // The child's start also carried the parent's '>' and the line feed: 12 bytes, 11 blanks.
-    QTest::newRow("aligned child")
-        << true << QStringList{"S Root", "X Child", "A x=1", "A y=2", "E", "E"}
-        << "\n<Root>\n    <Child x=\"1\"\n            y=\"2\"/>\n</Root>\n";
-    QTest::newRow("plain start after aligned one")
-        << true << QStringList{"X Root", "A a=1", "S Child", "A x=1", "A y=2", "E", "E"}
-        << "\n<Root a=\"1\">\n    <Child x=\"1\" y=\"2\"/>\n</Root>\n";
+    row("aligned child", true, "S Root|X Child|A x=1|A y=2|E|E",
+        "\n<Root>\n    <Child x=\"1\"\n            y=\"2\"/>\n</Root>\n");
+    row("plain start after aligned one", true, "X Root|A a=1|S Child|A x=1|A y=2|E|E",
+        "\n<Root a=\"1\">\n    <Child x=\"1\" y=\"2\"/>\n</Root>\n");
     const QString longName(60, QLatin1Char('n'));
-    QTest::newRow("indent capped at 40")
-        << true << QStringList{"X " + longName, "A a=1", "A b=2", "E"}
-        << "\n<" + longName + " a=\"1\"\n" + QString(40, QLatin1Char(' ')) + "b=\"2\"/>\n";
+    row("indent capped at 40", true, "X " + longName + "|A a=1|A b=2|E",
+        "\n<" + longName + " a=\"1\"\n" + QString(40, QLatin1Char(' ')) + "b=\"2\"/>\n");
     // Root: 3 - 4 + 6 = 5, so the aligned empty line carries 4 blanks, which the next element
     // uses as its indentation (the base writer does not indent after characters).
-    QTest::newRow("section comment after aligned start")
-        << true << QStringList{"X Root", "A a=1", "C Part one", "S Item", "E", "E"}
-        << "\n<Root a=\"1\">\n\n<!--Part one-->\n\n    <Item/>\n</Root>\n";
+    row("section comment after aligned start", true, "X Root|A a=1|C Part one|S Item|E|E",
+        "\n<Root a=\"1\">\n\n<!--Part one-->\n\n    <Item/>\n</Root>\n");
     // Without alignment the comment is followed by the indentation of the current depth.
-    QTest::newRow("section comment after plain start")
-        << true << QStringList{"S Root", "S Group", "C Next", "E", "E"}
-        << "\n<Root>\n    <Group>\n\n<!--Next-->\n\n        </Group>\n</Root>\n";
-    QTest::newRow("empty section comment writes nothing")
-        << false << QStringList{"S Root", "C ", "E"} << "<Root/>\n";
+    row("section comment after plain start", true, "S Root|S Group|C Next|E|E",
+        "\n<Root>\n    <Group>\n\n<!--Next-->\n\n        </Group>\n</Root>\n");
+    row("empty section comment writes nothing", false, "S Root|C |E", "<Root/>\n");
     // "<Root" took 5 bytes: 3 - 4 + 5 = 4, so 3 blanks.
-    QTest::newRow("empty lines and indent")
-        << false << QStringList{"X Root", "Y", "L", "I 2", "E"} << "<Root\n   \n\n        />\n";
-    QTest::newRow("aligned empty line needs aligned start")
-        << false << QStringList{"S Root", "Y", "T x", "E"} << "<Root>x</Root>\n";
+    row("empty lines and indent", false, "X Root|Y|L|I 2|E", "<Root\n   \n\n        />\n");
+    row("aligned empty line needs aligned start", false, "S Root|Y|T x|E", "<Root>x</Root>\n");
 }
 
 void TestXml::writerLayout()
 {
     QFETCH(bool, autoFormat);
-    QFETCH(QStringList, script);
+    QFETCH(QString, script);
     QByteArray out;
     ZuXmlStreamWriter w(&out);
     w.setAutoFormatting(autoFormat);
     w.writeStartDocument();
-    for (const QString& step : script) {
+    for (const QString& step : script.split(QLatin1Char('|'))) {
         const QString arg = step.mid(2);
         // clang-format off
         switch (step.at(0).toLatin1()) {
@@ -225,6 +220,7 @@ void TestXml::writerWithoutDevice()
     QCOMPARE(out, QByteArray("\n   "));
 }
 
+// The readers look at the whole string of the stream, not at what is left of it.
 void TestXml::textStreamOperators_data()
 {
     QTest::addColumn<QString>("text");
@@ -243,10 +239,9 @@ void TestXml::textStreamOperators()
     QFETCH(QUuid, uuid);
     QTextStream in(&text);
     QString firstWord;
-    in >> firstWord; // the readers look at the whole string, not at what is left
     bool readBool = false;
     QUuid readUuid = QUuid::createUuid();
-    in >> readBool >> readUuid;
+    in >> firstWord >> readBool >> readUuid;
     QTEST(readBool, "boolValue");
     QCOMPARE(readUuid, uuid);
 
