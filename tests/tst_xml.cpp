@@ -19,8 +19,7 @@ private slots:
     void integerList();
     void typedAttributes_data();
     void typedAttributes();
-    void builderChains();
-    void builderWithoutDocument();
+    void builder();
     void writerLayout_data();
     void writerLayout();
     void writerWithoutDevice();
@@ -30,68 +29,55 @@ private slots:
 
 void TestXml::stringToBool_data()
 {
-    QTest::addColumn<QString>("text");
+    QTest::addColumn<QStringList>("texts");
     QTest::addColumn<int>("expected");
-    const struct
-    {
-        const char* text;
-        int expected;
-    } cases[] = {{"TRUE", 1}, {"On", 1},    {"yes", 1},   {"1", 1}, {"0", 0},
-                 {"no", 0},   {"OFF", 0},   {"False", 0}, {"", -1}, {" true", -1},
-                 {"2", -1},   {"yes ", -1}, {"y", -1}};
-    for (const auto& c : cases)
-        QTest::newRow(c.text[0] ? c.text : "(empty)") << QString::fromLatin1(c.text) << c.expected;
+    QTest::newRow("yes words") << QStringList{"TRUE", "On", "yes", "1"} << 1;
+    QTest::newRow("no words") << QStringList{"0", "no", "OFF", "False"} << 0;
+    QTest::newRow("neither") << QStringList{"", " true", "2", "yes ", "y"} << -1;
 }
 
 void TestXml::stringToBool()
 {
-    QFETCH(QString, text);
-    QFETCH(int, expected);
-    QCOMPARE(ZuDom::qStringToBool(text), expected);
+    QFETCH(QStringList, texts);
+    for (const QString& text : texts)
+        QTEST(ZuDom::qStringToBool(text), "expected");
 }
 
 void TestXml::integerList_data()
 {
     QTest::addColumn<QString>("text");
     QTest::addColumn<bool>("ok");
-    QTest::addColumn<QList<int>>("numbers");
+    QTest::addColumn<QList<int>>("numbers"); // what was read until the failure
     QTest::newRow("three") << "1 2 3" << true << QList<int>{1, 2, 3};
-    QTest::newRow("negative") << "-4 10" << true << QList<int>{-4, 10};
     QTest::newRow("empty text") << "" << false << QList<int>{};
     QTest::newRow("double blank") << "1  2" << false << QList<int>{1};
     QTest::newRow("word inside") << "1 x 3" << false << QList<int>{1};
     QTest::newRow("trailing blank") << "7 " << false << QList<int>{7};
-    QTest::newRow("hex is not base 10") << "0x10" << false << QList<int>{};
 }
 
 void TestXml::integerList()
 {
     QFETCH(QString, text);
-    QFETCH(bool, ok);
-    QFETCH(QList<int>, numbers);
     QList<int> out{99, 98}; // stale content must go
-    QCOMPARE(ZuDom::readIntegerListParams(text, out), ok);
-    QCOMPARE(out, numbers);
+    QTEST(ZuDom::readIntegerListParams(text, out), "ok");
+    QTEST(out, "numbers");
 }
 
+// Reads int, float and bool from attribute "v", starting from -7, -7.5 and true; "!" marks a
+// failed read, which must leave the start value.
 void TestXml::typedAttributes_data()
 {
     QTest::addColumn<QString>("xml");
-    QTest::addColumn<bool>("intOk");
-    QTest::addColumn<int>("intValue");
-    QTest::addColumn<bool>("floatOk");
-    QTest::addColumn<float>("floatValue");
-    QTest::addColumn<bool>("boolOk");
-    QTest::addColumn<bool>("boolValue");
-    // Failed reads leave the sentinels -7, -7.5 and true in place.
-    QTest::newRow("number") << "<e v=\"12\"/>" << true << 12 << true << 12.0f << false << true;
-    QTest::newRow("trailing letters")
-        << "<e v=\"12abc\"/>" << false << -7 << false << -7.5f << false << true;
-    QTest::newRow("missing") << "<e/>" << false << -7 << false << -7.5f << false << true;
-    QTest::newRow("float") << "<e v=\"2.5\"/>" << false << -7 << true << 2.5f << false << true;
-    QTest::newRow("zero") << "<e v=\"0\"/>" << true << 0 << true << 0.0f << true << false;
-    QTest::newRow("word off") << "<e v=\"Off\"/>" << false << -7 << false << -7.5f << true << false;
-    QTest::newRow("word yes") << "<e v=\"YES\"/>" << false << -7 << false << -7.5f << true << true;
+    QTest::addColumn<QString>("read");
+    auto row = [](const char* inName, const char* inXml, const char* inRead) {
+        QTest::newRow(inName) << QString::fromLatin1(inXml) << QString::fromLatin1(inRead);
+    };
+    row("number", "<e v=\"12\"/>", "12 12 !true");
+    row("zero", "<e v=\"0\"/>", "0 0 false");
+    row("float", "<e v=\"2.5\"/>", "!-7 2.5 !true");
+    row("trailing letters", "<e v=\"12abc\"/>", "!-7 !-7.5 !true");
+    row("word", "<e v=\"Off\"/>", "!-7 !-7.5 false");
+    row("missing", "<e/>", "!-7 !-7.5 !true");
 }
 
 void TestXml::typedAttributes()
@@ -100,25 +86,21 @@ void TestXml::typedAttributes()
     QDomDocument document;
     QVERIFY(document.setContent(xml));
     const QDomElement element = document.documentElement();
-
     int i = -7;
     float f = -7.5f;
     bool b = true;
-    QTEST(ZuDom::getAttribute(element, "v", i), "intOk");
-    QTEST(i, "intValue");
-    QTEST(ZuDom::getAttribute(element, "v", f), "floatOk");
-    QTEST(f, "floatValue");
-    QTEST(ZuDom::getAttribute(element, "v", b), "boolOk");
-    QTEST(b, "boolValue");
-
+    const bool intOk = ZuDom::getAttribute(element, "v", i);
+    const bool floatOk = ZuDom::getAttribute(element, "v", f);
+    const bool boolOk = ZuDom::getAttribute(element, "v", b);
+    QTEST(QString::asprintf("%s%d %s%g %s%s", intOk ? "" : "!", i, floatOk ? "" : "!", double(f),
+                            boolOk ? "" : "!", b ? "true" : "false"),
+          "read");
     // A null element reads like a missing attribute, and setting on it is ignored.
     QVERIFY(!ZuDom::getAttribute(QDomElement(), "v", i));
     ZuDom::setAttribute(QDomElement(), "v", QStringLiteral("1"));
-    ZuDom::setAttribute(element, "w", QStringLiteral("x&y"));
-    QCOMPARE(element.attribute(QStringLiteral("w")), QStringLiteral("x&y"));
 }
 
-void TestXml::builderChains()
+void TestXml::builder()
 {
     ZuXmlBuilder builder;
     ZuXmlBuilder::Element root = builder.createRootElement(QStringLiteral("Config"));
@@ -130,136 +112,90 @@ void TestXml::builderChains()
         .addCDATA(QStringLiteral("x]y"))
         .addText(QStringLiteral("t"));
     QVERIFY(root.parent().isNull());
-    QVERIFY(!root.isNull());
+    QCOMPARE(QDomElement(root).tagName(), QStringLiteral("Config"));
 
-    // Copies of the builder share the document.
+    // Copies of the builder share the document; clear() drops one handle only.
     ZuXmlBuilder copy = builder;
+    builder.clear();
+    QVERIFY(builder.document().isNull());
     QCOMPARE(copy.document().toString(-1),
              QStringLiteral("<Config version=\"2\"><Item>a &lt; b<!--note-->\n</Item>"
                             "<Data><![CDATA[x]y]]>t</Data></Config>"));
-    QDomElement asDom = root;
-    QCOMPARE(asDom.tagName(), QStringLiteral("Config"));
 
-    builder.clear();
-    QVERIFY(builder.document().isNull());
-    // clear() drops this handle only; the copy keeps the document.
-    QCOMPARE(copy.document().documentElement().tagName(), QStringLiteral("Config"));
-}
-
-void TestXml::builderWithoutDocument()
-{
+    // Without a builder nothing is added anywhere.
     ZuXmlBuilder::Element none;
-    QVERIFY(none.isNull());
-    QVERIFY(none.addChild(QStringLiteral("a")).isNull());
-    QVERIFY(none.addChild(QStringLiteral("a"), QStringLiteral("t")).isNull());
-    QVERIFY(none.addText(QStringLiteral("t")).isNull());
-    QVERIFY(none.addComment(QStringLiteral("c")).isNull());
-    QVERIFY(none.addCDATA(QStringLiteral("d")).isNull());
-    QVERIFY(none.parent().isNull());
-    QVERIFY(none.toQDomElement().isNull());
+    QVERIFY(none.isNull() && none.addChild(QStringLiteral("a")).isNull() &&
+            none.addChild(QStringLiteral("a"), QStringLiteral("t")).isNull() &&
+            none.addText(QStringLiteral("t")).isNull() &&
+            none.addComment(QStringLiteral("c")).isNull() &&
+            none.addCDATA(QStringLiteral("d")).isNull() && none.parent().isNull());
 }
 
-// Steps of a writer script: "S name" start, "X name" aligned start, "A name=value" attribute,
-// "E" end, "C text" section comment, "L" empty line, "LX" aligned empty line, "I n" indent,
-// "T text" characters.
+// Attributes are written with a blank before them, so an aligned one has a blank more than the
+// line break. Steps of a writer script, split at "|": "S name" start, "X name" aligned start, "A
+// name=value" attribute, "E" end, "C text" section comment, "L" empty line, "Y" aligned empty line,
+// "I n" indent, "T text" characters.
 void TestXml::writerLayout_data()
 {
     QTest::addColumn<bool>("autoFormat");
-    QTest::addColumn<QStringList>("script");
-    QTest::addColumn<QString>("expected");
-
-    QTest::newRow("aligned root") << true << QStringList{"X Root", "A a=1", "A bb=2", "A c=3", "E"}
-                                  << "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
-                                     "<Root a=\"1\"\n"
-                                     "      bb=\"2\"\n"
-                                     "      c=\"3\"/>\n";
-    QTest::newRow("plain start keeps one line")
-        << true << QStringList{"S Root", "A a=1", "A bb=2", "A c=3", "E"}
-        << "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
-           "<Root a=\"1\" bb=\"2\" c=\"3\"/>\n";
+    QTest::addColumn<QString>("script");
+    QTest::addColumn<QString>("expected"); // what follows the XML declaration
+    auto row = [](const char* inName, bool inAutoFormat, const QString& inScript,
+                  const QString& inExpected) {
+        QTest::newRow(inName) << inAutoFormat << inScript << inExpected;
+    };
+    row("aligned root", true, "X Root|A a=1|A bb=2|A c=3|E",
+        "\n<Root a=\"1\"\n      bb=\"2\"\n      c=\"3\"/>\n");
+    row("plain start keeps one line", true, "S Root|A a=1|A bb=2|A c=3|E",
+        "\n<Root a=\"1\" bb=\"2\" c=\"3\"/>\n");
     // The child's start also carried the parent's '>' and the line feed: 12 bytes, 11 blanks.
-    QTest::newRow("aligned child")
-        << true << QStringList{"S Root", "X Child", "A x=1", "A y=2", "E", "E"}
-        << "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
-           "<Root>\n"
-           "    <Child x=\"1\"\n"
-           "            y=\"2\"/>\n"
-           "</Root>\n";
-    QTest::newRow("plain start after aligned one")
-        << true << QStringList{"X Root", "A a=1", "S Child", "A x=1", "A y=2", "E", "E"}
-        << "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
-           "<Root a=\"1\">\n"
-           "    <Child x=\"1\" y=\"2\"/>\n"
-           "</Root>\n";
+    row("aligned child", true, "S Root|X Child|A x=1|A y=2|E|E",
+        "\n<Root>\n    <Child x=\"1\"\n            y=\"2\"/>\n</Root>\n");
+    row("plain start after aligned one", true, "X Root|A a=1|S Child|A x=1|A y=2|E|E",
+        "\n<Root a=\"1\">\n    <Child x=\"1\" y=\"2\"/>\n</Root>\n");
     const QString longName(60, QLatin1Char('n'));
-    QTest::newRow("indent capped at 40")
-        << true << QStringList{"X " + longName, "A a=1", "A b=2", "E"}
-        << "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<" + longName + " a=\"1\"\n" +
-               QString(40, QLatin1Char(' ')) + "b=\"2\"/>\n";
+    row("indent capped at 40", true, "X " + longName + "|A a=1|A b=2|E",
+        "\n<" + longName + " a=\"1\"\n" + QString(40, QLatin1Char(' ')) + "b=\"2\"/>\n");
     // Root: 3 - 4 + 6 = 5, so the aligned empty line carries 4 blanks, which the next element
     // uses as its indentation (the base writer does not indent after characters).
-    QTest::newRow("section comment after aligned start")
-        << true << QStringList{"X Root", "A a=1", "C Part one", "S Item", "E", "E"}
-        << "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
-           "<Root a=\"1\">\n\n<!--Part one-->\n\n    <Item/>\n"
-           "</Root>\n";
+    row("section comment after aligned start", true, "X Root|A a=1|C Part one|S Item|E|E",
+        "\n<Root a=\"1\">\n\n<!--Part one-->\n\n    <Item/>\n</Root>\n");
     // Without alignment the comment is followed by the indentation of the current depth.
-    QTest::newRow("section comment after plain start")
-        << true << QStringList{"S Root", "S Group", "C Next", "E", "E"}
-        << "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
-           "<Root>\n"
-           "    <Group>\n\n<!--Next-->\n\n        </Group>\n"
-           "</Root>\n";
-    QTest::newRow("empty section comment writes nothing")
-        << false << QStringList{"S Root", "C ", "E"}
-        << "<?xml version=\"1.0\" encoding=\"UTF-8\"?><Root/>\n";
+    row("section comment after plain start", true, "S Root|S Group|C Next|E|E",
+        "\n<Root>\n    <Group>\n\n<!--Next-->\n\n        </Group>\n</Root>\n");
+    row("empty section comment writes nothing", false, "S Root|C |E", "<Root/>\n");
     // "<Root" took 5 bytes: 3 - 4 + 5 = 4, so 3 blanks.
-    QTest::newRow("empty lines and indent")
-        << false << QStringList{"X Root", "LX", "L", "I 2", "E"}
-        << "<?xml version=\"1.0\" encoding=\"UTF-8\"?><Root\n   \n\n        />\n";
-    QTest::newRow("aligned empty line needs aligned start")
-        << false << QStringList{"S Root", "LX", "T x", "E"}
-        << "<?xml version=\"1.0\" encoding=\"UTF-8\"?><Root>x</Root>\n";
+    row("empty lines and indent", false, "X Root|Y|L|I 2|E", "<Root\n   \n\n        />\n");
+    row("aligned empty line needs aligned start", false, "S Root|Y|T x|E", "<Root>x</Root>\n");
 }
 
 void TestXml::writerLayout()
 {
     QFETCH(bool, autoFormat);
-    QFETCH(QStringList, script);
-    QFETCH(QString, expected);
-
+    QFETCH(QString, script);
     QByteArray out;
-    ZuXmlStreamWriter writer(&out);
-    writer.setAutoFormatting(autoFormat);
-    writer.writeStartDocument();
-    for (const QString& step : script) {
-        const QString op = step.section(QLatin1Char(' '), 0, 0);
-        const QString arg = step.section(QLatin1Char(' '), 1);
-        if (op == QLatin1String("S")) {
-            writer.writeStartElement(arg);
-        } else if (op == QLatin1String("X")) {
-            writer.writeStartElementExt(arg);
-        } else if (op == QLatin1String("A")) {
-            writer.writeAttribute(arg.section(QLatin1Char('='), 0, 0),
-                                  arg.section(QLatin1Char('='), 1));
-        } else if (op == QLatin1String("E")) {
-            writer.writeEndElement();
-        } else if (op == QLatin1String("C")) {
-            writer.writeSectionComment(arg);
-        } else if (op == QLatin1String("L")) {
-            writer.writeEmptyLine();
-        } else if (op == QLatin1String("LX")) {
-            writer.writeEmptyLineExt();
-        } else if (op == QLatin1String("I")) {
-            writer.indent(arg.toInt());
-        } else if (op == QLatin1String("T")) {
-            writer.writeCharacters(arg);
-        } else {
-            QFAIL(qPrintable("bad step " + step));
+    ZuXmlStreamWriter w(&out);
+    w.setAutoFormatting(autoFormat);
+    w.writeStartDocument();
+    for (const QString& step : script.split(QLatin1Char('|'))) {
+        const QString arg = step.mid(2);
+        // clang-format off
+        switch (step.at(0).toLatin1()) {
+        case 'S': w.writeStartElement(arg); break;
+        case 'X': w.writeStartElementExt(arg); break;
+        case 'A': w.writeAttribute(arg.section('=', 0, 0), arg.section('=', 1)); break;
+        case 'E': w.writeEndElement(); break;
+        case 'C': w.writeSectionComment(arg); break;
+        case 'L': w.writeEmptyLine(); break;
+        case 'Y': w.writeEmptyLineExt(); break;
+        case 'I': w.indent(arg.toInt()); break;
+        case 'T': w.writeCharacters(arg); break;
+        default: QFAIL(qPrintable("bad step " + step));
         }
+        // clang-format on
     }
-    writer.writeEndDocument();
-    QCOMPARE(QString::fromUtf8(out), expected);
+    w.writeEndDocument();
+    QTEST(QString::fromUtf8(out).section(QLatin1Char('>'), 1), "expected");
 }
 
 void TestXml::writerWithoutDevice()
@@ -284,6 +220,7 @@ void TestXml::writerWithoutDevice()
     QCOMPARE(out, QByteArray("\n   "));
 }
 
+// The readers look at the whole string of the stream, not at what is left of it.
 void TestXml::textStreamOperators_data()
 {
     QTest::addColumn<QString>("text");
@@ -291,9 +228,7 @@ void TestXml::textStreamOperators_data()
     QTest::addColumn<QUuid>("uuid");
     const QUuid id(QStringLiteral("{6f1a3c2e-1b2d-4e5f-8a9b-0c1d2e3f4a5b}"));
     QTest::newRow("True") << "True" << true << QUuid();
-    QTest::newRow("TRUE") << "TRUE" << true << QUuid();
     QTest::newRow("yes is not true") << "yes" << false << QUuid();
-    QTest::newRow("padded is not true") << " true" << false << QUuid();
     QTest::newRow("uuid") << id.toString() << false << id;
     QTest::newRow("uuid without braces") << "6f1a3c2e-1b2d-4e5f-8a9b-0c1d2e3f4a5b" << false << id;
 }
@@ -301,24 +236,18 @@ void TestXml::textStreamOperators_data()
 void TestXml::textStreamOperators()
 {
     QFETCH(QString, text);
-    QFETCH(bool, boolValue);
     QFETCH(QUuid, uuid);
-    QString source = text;
-    QTextStream in(&source);
+    QTextStream in(&text);
     QString firstWord;
-    in >> firstWord; // the readers look at the whole string, not at what is left
-    bool readBool = !boolValue;
+    bool readBool = false;
     QUuid readUuid = QUuid::createUuid();
-    in >> readBool;
-    in >> readUuid;
-    QCOMPARE(readBool, boolValue);
+    in >> firstWord >> readBool >> readUuid;
+    QTEST(readBool, "boolValue");
     QCOMPARE(readUuid, uuid);
 
     QString written;
     QTextStream out(&written);
-    const bool yes = true;
-    const bool no = false;
-    out << yes << ' ' << no << ' ' << uuid;
+    out << true << ' ' << false << ' ' << uuid;
     out.flush();
     QCOMPARE(written, "true false " + uuid.toString());
 }

@@ -26,6 +26,12 @@ ZuHtmlTable::Attributes mergedAttributes(const ZuHtmlTable::Attributes& inDefaul
     return result;
 }
 
+// The text of an enumerator, indexed by its fixed value; any other value has an empty text.
+template <int N> QString enumeratorText(const char* const (&inTexts)[N], int inValue)
+{
+    return inValue >= 0 && inValue < N ? QString::fromLatin1(inTexts[inValue]) : QString();
+}
+
 QVector<ZuHtmlTable::Cell> cellsOf(const QStringList& inTexts)
 {
     QVector<ZuHtmlTable::Cell> cells;
@@ -39,51 +45,21 @@ QVector<ZuHtmlTable::Cell> cellsOf(const QStringList& inTexts)
 
 QString ZuHtmlTable::alignmentText(Alignment inAlignment)
 {
-    switch (inAlignment) {
-    case AlignLeft:
-        return QStringLiteral("left");
-    case AlignRight:
-        return QStringLiteral("right");
-    case AlignCenter:
-        return QStringLiteral("center");
-    case AlignJustify:
-        return QStringLiteral("justify");
-    }
-    return QString();
+    static const char* const kTexts[] = {"left", "right", "center", "justify"};
+    return enumeratorText(kTexts, inAlignment);
 }
 
 QString ZuHtmlTable::attributeName(CellAttribute inAttribute)
 {
-    switch (inAttribute) {
-    case CellBgColor:
-        return QStringLiteral("bgcolor");
-    case CellWidth:
-        return QStringLiteral("width");
-    case CellAlign:
-        return QStringLiteral("align");
-    case CellColSpan:
-        return QStringLiteral("colspan");
-    case CellStyle:
-        return QStringLiteral("style");
-    }
-    return QString();
+    static const char* const kNames[] = {"bgcolor", "width", "align", "colspan", "style"};
+    return enumeratorText(kNames, inAttribute);
 }
 
 QString ZuHtmlTable::attributeName(TableAttribute inAttribute)
 {
-    switch (inAttribute) {
-    case TableBgColor:
-        return QStringLiteral("bgcolor");
-    case TableWidth:
-        return QStringLiteral("width");
-    case TableBorder:
-        return QStringLiteral("border");
-    case TableCellSpacing:
-        return QStringLiteral("cellspacing");
-    case TableCellPadding:
-        return QStringLiteral("cellpadding");
-    }
-    return QString();
+    static const char* const kNames[] = {"bgcolor", "width", "border", "cellspacing",
+                                         "cellpadding"};
+    return enumeratorText(kNames, inAttribute);
 }
 
 void ZuHtmlTable::Cell::setAttribute(CellAttribute inAttribute, const QString& inValue)
@@ -125,9 +101,7 @@ void ZuHtmlTable::addRow(const QStringList& inTexts)
 
 ZuHtmlTable::Cell* ZuHtmlTable::cellAt(int inColumn, int inRow)
 {
-    if (inRow < 0 || inRow >= mRows.size() || inColumn < 0 || inColumn >= mRows[inRow].size())
-        return nullptr;
-    return &mRows[inRow][inColumn];
+    return const_cast<Cell*>(static_cast<const ZuHtmlTable&>(*this).cellAt(inColumn, inRow));
 }
 
 const ZuHtmlTable::Cell* ZuHtmlTable::cellAt(int inColumn, int inRow) const
