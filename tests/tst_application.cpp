@@ -9,7 +9,6 @@
 #include <QEventLoop>
 #include <QPointer>
 #include <QPushButton>
-#include <QSplashScreen>
 #include <QTemporaryDir>
 #include <QThread>
 #include <QUrl>
@@ -103,15 +102,6 @@ QStringList deferredDeleteLines(const RkLogCapture& inCapture)
     return lines;
 }
 
-class AboutReceiver : public QObject
-{
-    Q_OBJECT
-public:
-    int hits = 0;
-public slots:
-    void about() { ++hits; }
-};
-
 class FileOpenAccess : public ZuApplication
 {
 public:
@@ -133,11 +123,9 @@ private slots:
     void environment_data();
     void environment();
     void hooks();
-    void hooksOnOtherThread();
     void wheelGrab();
     void busyNesting();
     void flushPendingEvents();
-    void splashAndAbout();
     void protocolHandler_data();
     void protocolHandler();
     void deferredDelete();
@@ -269,35 +257,6 @@ void TestApplication::hooks()
     QCOMPARE(dispatch(), QStringLiteral("d.before e.before c.before c.after e.after d.after"));
 }
 
-void TestApplication::hooksOnOtherThread()
-{
-    // Hooks see events dispatched on any thread; only the main thread uses the notify stack.
-    struct ThreadHook : ZuApplication::HookNotify
-    {
-        QAtomicInt calls;
-        QAtomicInt depth{-1};
-        void beforeNotify(QObject*, QEvent* inEvent) override { afterNotify(nullptr, inEvent); }
-        void afterNotify(QObject*, QEvent* inEvent) override
-        {
-            if (inEvent->type() == sTestEvent && !ZuApplication::isMainThread()) {
-                calls.ref();
-                depth = ZuApplication::callDepth_of_notify();
-            }
-        }
-    };
-    ThreadHook* hook = install(new ThreadHook);
-    QThread thread;
-    auto* receiver = new Receiver;
-    receiver->moveToThread(&thread);
-    QObject::connect(&thread, &QThread::finished, receiver, &QObject::deleteLater);
-    thread.start();
-    QCoreApplication::postEvent(receiver, new QEvent(sTestEvent));
-    QTRY_COMPARE(hook->calls.loadAcquire(), 2);
-    QCOMPARE(hook->depth.loadAcquire(), 0);
-    thread.quit();
-    QVERIFY(thread.wait(10000));
-}
-
 void TestApplication::wheelGrab()
 {
     QStringList calls;
@@ -334,25 +293,18 @@ void TestApplication::busyNesting()
         const QCursor* cursor = QGuiApplication::overrideCursor();
         shapes << (cursor ? int(cursor->shape()) : -1);
     };
-    {
-        ZuApplication::Busy idle(false); // outside a busy phase: nothing
+    std::unique_ptr<ZuApplication::Busy> idle(new ZuApplication::Busy(false));
+    note(); // outside a busy phase: nothing
+    idle.reset();
+    std::vector<std::unique_ptr<ZuApplication::Busy>> stack;
+    for (bool busy : {true, false, true}) {
+        stack.emplace_back(new ZuApplication::Busy(busy));
         note();
     }
-    {
-        ZuApplication::Busy busy(true);
-        note();
-        {
-            ZuApplication::Busy modal(false);
-            note();
-            {
-                ZuApplication::Busy inner(true);
-                note();
-            }
-            note();
-        }
+    while (!stack.empty()) {
+        stack.pop_back();
         note();
     }
-    note();
     const int wait = Qt::WaitCursor, arrow = Qt::ArrowCursor;
     QCOMPARE(shapes, QList<int>({-1, wait, arrow, wait, arrow, wait, -1}));
 }
@@ -373,29 +325,6 @@ void TestApplication::flushPendingEvents()
     QVERIFY2(afterFlush >= 19 && afterFlush <= 3 * 19, qPrintable(QString::number(afterFlush)));
     endless.repost = -1; // let the last posted event end the chain
     QTRY_COMPARE(endless.tests, afterFlush + 1);
-}
-
-void TestApplication::splashAndAbout()
-{
-    ZuApplication* app = ZuApplication::instance();
-    QPixmap pixmap(40, 20);
-    pixmap.fill(Qt::blue);
-    QPointer<QSplashScreen> first = new QSplashScreen(pixmap);
-    app->setSplashScreen(first);
-    QVERIFY(first->isVisible());
-    QPointer<QSplashScreen> second = new QSplashScreen(pixmap);
-    app->setSplashScreen(second); // replaces and deletes the first
-    QVERIFY(first.isNull());
-    QVERIFY(second->isVisible());
-    app->setSplashScreen(nullptr);
-    QVERIFY(second.isNull());
-
-    AboutReceiver one, two;
-    app->connectShowAbout(&one, SLOT(about()));
-    app->showAbout();
-    app->connectShowAbout(&two, SLOT(about())); // drops the connection to one
-    app->showAbout();
-    QCOMPARE(QList<int>({one.hits, two.hits}), QList<int>({1, 1}));
 }
 
 void TestApplication::protocolHandler_data()

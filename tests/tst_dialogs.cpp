@@ -13,10 +13,7 @@
 #include "rklib/RkDbC.h"
 #include "rklib/RkLogFile.h"
 
-#include <QAbstractButton>
-#include <QDialogButtonBox>
 #include <QIntValidator>
-#include <QLabel>
 #include <QLineEdit>
 #include <QPlainTextEdit>
 #include <QPointer>
@@ -110,8 +107,6 @@ private slots:
     void execKeepsDialog();
     void staticFunctions_data();
     void staticFunctions();
-    void inputText();
-    void fileDialogProbe();
     void messageBoxes_data();
     void messageBoxes();
     void overwrite_data();
@@ -315,6 +310,19 @@ void TestDialogs::staticFunctions_data()
             d->setTextValue("line 1\nline 2");
     }) << QVariant(QVariantList{"line 1\nline 2", true})
                                 << QVariant(QVariantList{QString(), false});
+    // The own text dialog: password echo, and a validator that drops the letter.
+    static QIntValidator validator(0, 999);
+    QTest::newRow("text") << Call([=] {
+        const QString text =
+            ZuInputDialog::getText(nullptr, "Number", "Enter:", QLineEdit::Password, "5", &ok, {},
+                                   Qt::ImhDigitsOnly, &validator);
+        return QVariantList{text, text.isNull(), ok};
+    }) << Act([](QWidget* inModal) {
+        auto* edit = inModal->findChild<QLineEdit*>();
+        if (edit && edit->echoMode() == QLineEdit::Password)
+            QTest::keyClicks(edit, QStringLiteral("12a3")); // replaces the selected "5"
+    }) << QVariant(QVariantList{"123", false, true})
+                          << QVariant(QVariantList{QString(), true, false});
     const Act select = on<QFileDialog>([file](QFileDialog* d) { d->selectFile(file); });
     QTest::newRow("open file") << Call([=] {
         return QVariant(ZuFileDialog::getOpenFileName(nullptr, "Open", dir, "Studies (*.dcm)"));
@@ -341,80 +349,31 @@ void TestDialogs::staticFunctions()
     QFETCH(QVariant, accepted);
     QFETCH(QVariant, cancelled);
     QFile(mDir.filePath(QStringLiteral("study one.dcm"))).open(QIODevice::WriteOnly);
+    // File dialogs run with the crash probe on and leave it as it was (the second round starts
+    // with it on), and reset the locale.
     for (bool accept : {true, false}) {
         const QVariant expected = accept ? accepted : cancelled;
         if (!expected.isValid())
             continue;
+        rkEnableProbeDellBackupAndRecoveryCrash(!accept);
+        std::setlocale(LC_ALL, "C.UTF-8");
         QWidget* parent = nullptr;
+        bool isFile = false, probeOn = false;
         whenModal([&](QWidget* inModal) {
             parent = inModal->parentWidget();
+            isFile = qobject_cast<QFileDialog*>(inModal);
+            probeOn = rkProbeDellBackupAndRecoveryCrashEnabled();
             if (act)
                 act(inModal);
             finish(inModal, accept);
         });
         QCOMPARE(call(), expected);
         QCOMPARE(parent, mMain.get());
+        QCOMPARE(probeOn, isFile || !accept);
+        QCOMPARE(rkEnableProbeDellBackupAndRecoveryCrash(false), !accept);
+        if (isFile)
+            QCOMPARE(QByteArray(std::setlocale(LC_ALL, nullptr)), QByteArray("C"));
     }
-}
-
-void TestDialogs::inputText()
-{
-    // The own getText dialog: label, line edit with validator and echo mode, Ok and Cancel.
-    QIntValidator validator(0, 999);
-    QString label;
-    int echo = -1;
-    bool validated = false;
-    whenModal([&](QWidget* inModal) {
-        auto* edit = inModal->findChild<QLineEdit*>();
-        auto* text = inModal->findChild<QLabel*>();
-        auto* box = inModal->findChild<QDialogButtonBox*>();
-        if (!edit || !text || !box)
-            return finish(inModal, false);
-        label = text->text();
-        echo = edit->echoMode();
-        validated = edit->validator() == &validator;
-        QTest::keyClicks(edit, QStringLiteral("12a3")); // replaces the selected "5"
-        box->button(QDialogButtonBox::Ok)->click();
-    });
-    bool ok = false;
-    QCOMPARE(ZuInputDialog::getText(nullptr, "Number", "Enter:", QLineEdit::Password, "5", &ok, {},
-                                    Qt::ImhDigitsOnly, &validator),
-             QStringLiteral("123"));
-    QVERIFY(ok);
-    QCOMPARE(label, QStringLiteral("Enter:"));
-    QCOMPARE(echo, int(QLineEdit::Password));
-    QVERIFY(validated);
-
-    whenModal([](QWidget* inModal) {
-        if (auto* box = inModal->findChild<QDialogButtonBox*>())
-            box->button(QDialogButtonBox::Cancel)->click();
-    });
-    QVERIFY(
-        ZuInputDialog::getText(nullptr, "Number", "Enter:", QLineEdit::Normal, "5", &ok).isNull());
-    QVERIFY(!ok);
-}
-
-void TestDialogs::fileDialogProbe()
-{
-    // The crash probe is on while the dialog runs and back off afterwards; the locale is reset.
-    QVERIFY(!rkProbeDellBackupAndRecoveryCrashEnabled());
-    std::setlocale(LC_ALL, "C.UTF-8");
-    bool probeOn = false;
-    whenModal([&](QWidget* inModal) {
-        probeOn = rkProbeDellBackupAndRecoveryCrashEnabled();
-        finish(inModal, false);
-    });
-    ZuFileDialog::getOpenFileName(nullptr, "Open", mDir.path());
-    QVERIFY(probeOn);
-    QVERIFY(!rkProbeDellBackupAndRecoveryCrashEnabled());
-    QCOMPARE(QByteArray(std::setlocale(LC_ALL, nullptr)), QByteArray("C"));
-
-    // A probe that was on stays on.
-    rkEnableProbeDellBackupAndRecoveryCrash(true);
-    whenModal([](QWidget* inModal) { finish(inModal, false); });
-    ZuFileDialog::getExistingDirectory(nullptr, "Dir", mDir.path());
-    QVERIFY(rkProbeDellBackupAndRecoveryCrashEnabled());
-    rkEnableProbeDellBackupAndRecoveryCrash(false);
 }
 
 void TestDialogs::messageBoxes_data()
@@ -496,8 +455,12 @@ void TestDialogs::messageBoxSplashAndCursor()
 {
     QPixmap pixmap(30, 20);
     pixmap.fill(Qt::green);
+    QPointer<QSplashScreen> first = new QSplashScreen(pixmap);
+    ZuApplication::instance()->setSplashScreen(first);
     QPointer<QSplashScreen> splash = new QSplashScreen(pixmap);
-    ZuApplication::instance()->setSplashScreen(splash);
+    ZuApplication::instance()->setSplashScreen(splash); // replaces and deletes the first
+    QVERIFY(first.isNull());
+    QVERIFY(splash->isVisible());
     ZuApplication::Busy busy(true);
     bool splashGone = false;
     int cursor = -1;
