@@ -1,44 +1,39 @@
 // Desktop geometry: TESSEL_MONITORS parsing, stretched screens, sorting, the span index and the
 // placement helpers. The window-system screens come from a replaceable screen list here;
-// tst_desktop_xvfb asks a real X server with several screens.
+// tst_appframe_xvfb asks a real X server with several screens.
 #include "zubase/ZuDesktop.h"
 #include "zubase/ZuDesktop_p.h"
 
 #include "rklib/RkLogFile.h"
 
-#include <QScreen>
 #include <QtTest>
 
 using ZuDesktop::DisplayInfo;
 using ZuDesktop::Internal::ScreenGeometry;
+using Screens = std::vector<ScreenGeometry>;
 
 namespace {
 
-std::vector<ScreenGeometry> sScreens;
-std::vector<ScreenGeometry> fakeScreens()
+Screens sScreens;
+Screens fakeScreens()
 {
     return sScreens;
 }
 
-// "x,y,w,h/ax,ay,aw,ah" plus " P" for primary and " S" for span.
+// "x,y,wxh", then "/ax,ay,awxah" when the available area differs, " P" primary, " S" span.
 QString describe(const std::vector<DisplayInfo>& inDisplays)
 {
     QStringList parts;
     for (const DisplayInfo& d : inDisplays) {
-        QString text = QStringLiteral("%1,%2,%3,%4/%5,%6,%7,%8")
-                           .arg(d.x)
-                           .arg(d.y)
-                           .arg(d.w)
-                           .arg(d.h)
-                           .arg(d.availableX)
-                           .arg(d.availableY)
-                           .arg(d.availableW)
-                           .arg(d.availableH);
-        if (d.isPrimary)
-            text += QLatin1String(" P");
-        if (d.span)
-            text += QLatin1String(" S");
-        parts << text;
+        QString text = QStringLiteral("%1,%2,%3x%4").arg(d.x).arg(d.y).arg(d.w).arg(d.h);
+        if (QRect(d.x, d.y, d.w, d.h) !=
+            QRect(d.availableX, d.availableY, d.availableW, d.availableH))
+            text += QStringLiteral("/%1,%2,%3x%4")
+                        .arg(d.availableX)
+                        .arg(d.availableY)
+                        .arg(d.availableW)
+                        .arg(d.availableH);
+        parts << text + (d.isPrimary ? " P" : "") + (d.span ? " S" : "");
     }
     return parts.join(QLatin1String("; "));
 }
@@ -50,7 +45,7 @@ ScreenGeometry screen(int inX, int inY, int inW, int inH, int inTaskBar = 0)
 
 } // namespace
 
-Q_DECLARE_METATYPE(std::vector<ScreenGeometry>)
+Q_DECLARE_METATYPE(Screens)
 
 class TestDesktop : public QObject
 {
@@ -58,15 +53,10 @@ class TestDesktop : public QObject
 private slots:
     void init();
     void cleanup();
-    void environment_data();
-    void environment();
-    void environmentAppends();
-    void windowSystem_data();
-    void windowSystem();
-    void windowSystemSortsExisting();
-    void noScreens();
+    void getDisplayInfo_data();
+    void getDisplayInfo();
+    void appendsToExisting();
     void placement();
-    void realScreen();
     void debugDump();
 };
 
@@ -83,111 +73,69 @@ void TestDesktop::cleanup()
     ZuDesktop::Internal::setScreenSource(nullptr);
 }
 
-void TestDesktop::environment_data()
+void TestDesktop::getDisplayInfo_data()
 {
-    QTest::addColumn<QString>("value");
-    QTest::addColumn<QString>("expected");
-
-    QTest::newRow("two sizes")
-        << "1920x1200,1920x1200"
-        << "0,0,1920,1200/0,0,1920,1200 P; 1920,0,1920,1200/1920,0,1920,1200";
-    QTest::newRow("negative, then placed after it")
-        << "1920x1080-1920+0 1920x1080"
-        << "-1920,0,1920,1080/-1920,0,1920,1080 P; 0,0,1920,1080/0,0,1920,1080";
-    QTest::newRow("both negative") << "1280x1024-1280-200"
-                                   << "-1280,-200,1280,1024/-1280,-200,1280,1024 P";
-    QTest::newRow("other sign characters keep the value") << "800x600*5#7"
-                                                          << "5,7,800,600/5,7,800,600 P";
-    QTest::newRow("not sorted") << "1024x768+1920+0,1920x1080+0+0"
-                                << "1920,0,1024,768/1920,0,1024,768 P; 0,0,1920,1080/0,0,1920,1080";
-    QTest::newRow("malformed tokens skipped")
-        << "abc,,800x600 x600\t\t1024x768+10 garbage"
-        << "0,0,800,600/0,0,800,600 P; 800,0,1024,768/800,0,1024,768";
-    QTest::newRow("empty") << ""
-                           << "";
-    QTest::newRow("nothing readable") << "monitors please"
-                                      << "";
-}
-
-void TestDesktop::environment()
-{
-    QFETCH(QString, value);
-    QFETCH(QString, expected);
-    qputenv("TESSEL_MONITORS", value.toLatin1());
-    // The window system is not asked while the variable is set, even when it gives nothing.
-    sScreens = {screen(0, 0, 3840, 1200)};
-
-    std::vector<DisplayInfo> displays;
-    bool fromEnvironment = false;
-    const int count = ZuDesktop::getDisplayInfo(displays, &fromEnvironment);
-    QCOMPARE(describe(displays), expected);
-    QCOMPARE(count, int(displays.size()));
-    QCOMPARE(fromEnvironment, !displays.empty());
-    QCOMPARE(ZuDesktop::Internal::spanIndex(), -1);
-    int x = 1, y = 1, w = 1, h = 1;
-    QVERIFY(!ZuDesktop::centerPositionOnSpan(x, y, w, h));
-    QCOMPARE(QList<int>({x, y, w, h}), QList<int>({0, 0, 0, 0}));
-}
-
-void TestDesktop::environmentAppends()
-{
-    qputenv("TESSEL_MONITORS", "640x480");
-    std::vector<DisplayInfo> displays(1);
-    displays[0].x = 100;
-    displays[0].w = 300;
-    displays[0].span = true;
-    QCOMPARE(ZuDesktop::getDisplayInfo(displays, nullptr), 2);
-    // Placed after the entry that was there, not primary; the old span entry is found.
-    QCOMPARE(describe({displays[1]}), QStringLiteral("400,0,640,480/400,0,640,480"));
-    QCOMPARE(ZuDesktop::Internal::spanIndex(), 0);
-}
-
-void TestDesktop::windowSystem_data()
-{
-    QTest::addColumn<std::vector<ScreenGeometry>>("screens");
+    // With TESSEL_MONITORS set the window system is not asked, even when the value gives nothing.
+    QTest::addColumn<QByteArray>("monitors"); // null: not set
+    QTest::addColumn<Screens>("screens");
     QTest::addColumn<QString>("expected");
     QTest::addColumn<int>("spanIndex");
+    const Screens wide = {screen(0, 0, 3840, 1200)};
+
+    QTest::newRow("env: two sizes")
+        << QByteArray("1920x1200,1920x1200") << wide << "0,0,1920x1200 P; 1920,0,1920x1200" << -1;
+    QTest::newRow("env: negative, then placed after it")
+        << QByteArray("1920x1080-1920+0 1920x1080") << wide << "-1920,0,1920x1080 P; 0,0,1920x1080"
+        << -1;
+    QTest::newRow("env: both negative")
+        << QByteArray("1280x1024-1280-200") << wide << "-1280,-200,1280x1024 P" << -1;
+    QTest::newRow("env: other sign characters keep the value")
+        << QByteArray("800x600*5#7") << wide << "5,7,800x600 P" << -1;
+    QTest::newRow("env: not sorted") << QByteArray("1024x768+1920+0,1920x1080+0+0") << wide
+                                     << "1920,0,1024x768 P; 0,0,1920x1080" << -1;
+    QTest::newRow("env: malformed tokens skipped")
+        << QByteArray("abc,,800x600 x600\t\t1024x768+10 garbage") << wide
+        << "0,0,800x600 P; 800,0,1024x768" << -1;
+    QTest::newRow("env: empty") << QByteArray("") << wide << "" << -1;
+    QTest::newRow("env: nothing readable") << QByteArray("monitors please") << wide << "" << -1;
 
     QTest::newRow("stretched 3840x1200")
-        << std::vector<ScreenGeometry>{screen(0, 0, 3840, 1200, 40)}
-        << "0,0,1920,1200/0,0,1920,1160 P S; 1920,0,1920,1200/1920,0,1920,1160 S" << 0;
+        << QByteArray() << Screens{screen(0, 0, 3840, 1200, 40)}
+        << "0,0,1920x1200/0,0,1920x1160 P S; 1920,0,1920x1200/1920,0,1920x1160 S" << 0;
     QTest::newRow("2560x1080 is not stretched")
-        << std::vector<ScreenGeometry>{screen(0, 0, 2560, 1080)} << "0,0,2560,1080/0,0,2560,1080 P"
-        << -1;
-    QTest::newRow("exactly 2.5 : 1") << std::vector<ScreenGeometry>{screen(0, 0, 2500, 1000)}
-                                     << "0,0,1250,1000/0,0,1250,1000 P S; "
-                                        "1250,0,1250,1000/1250,0,1250,1000 S"
-                                     << 0;
-    QTest::newRow("odd width 3841")
-        << std::vector<ScreenGeometry>{screen(100, 0, 3841, 1200)}
-        << "100,0,1920,1200/100,0,1920,1200 P S; 2020,0,1920,1200/2020,0,1920,1200 S" << 0;
+        << QByteArray() << Screens{screen(0, 0, 2560, 1080)} << "0,0,2560x1080 P" << -1;
+    QTest::newRow("exactly 2.5 : 1") << QByteArray() << Screens{screen(0, 0, 2500, 1000)}
+                                     << "0,0,1250x1000 P S; 1250,0,1250x1000 S" << 0;
+    QTest::newRow("odd width 3841") << QByteArray() << Screens{screen(100, 0, 3841, 1200)}
+                                    << "100,0,1920x1200 P S; 2020,0,1920x1200 S" << 0;
     QTest::newRow("sorted by x then y, span found after sorting")
-        << std::vector<ScreenGeometry>{screen(0, 0, 1920, 1200), screen(1920, 0, 3840, 1200),
-                                       screen(-1280, 200, 1280, 1024),
-                                       screen(-1280, -824, 1280, 1024)}
-        << "-1280,-824,1280,1024/-1280,-824,1280,1024; -1280,200,1280,1024/-1280,200,1280,1024; "
-           "0,0,1920,1200/0,0,1920,1200 P; 1920,0,1920,1200/1920,0,1920,1200 S; "
-           "3840,0,1920,1200/3840,0,1920,1200 S"
+        << QByteArray()
+        << Screens{screen(0, 0, 1920, 1200), screen(1920, 0, 3840, 1200),
+                   screen(-1280, 200, 1280, 1024), screen(-1280, -824, 1280, 1024)}
+        << "-1280,-824,1280x1024; -1280,200,1280x1024; 0,0,1920x1200 P; 1920,0,1920x1200 S; "
+           "3840,0,1920x1200 S"
         << 3;
     QTest::newRow("leftmost of two stretched screens")
-        << std::vector<ScreenGeometry>{screen(0, 0, 3840, 1200), screen(-3840, 0, 3840, 1200)}
-        << "-3840,0,1920,1200/-3840,0,1920,1200 S; -1920,0,1920,1200/-1920,0,1920,1200 S; "
-           "0,0,1920,1200/0,0,1920,1200 P S; 1920,0,1920,1200/1920,0,1920,1200 S"
-        << 0;
+        << QByteArray() << Screens{screen(0, 0, 3840, 1200), screen(-3840, 0, 3840, 1200)}
+        << "-3840,0,1920x1200 S; -1920,0,1920x1200 S; 0,0,1920x1200 P S; 1920,0,1920x1200 S" << 0;
 }
 
-void TestDesktop::windowSystem()
+void TestDesktop::getDisplayInfo()
 {
-    QFETCH(std::vector<ScreenGeometry>, screens);
+    QFETCH(QByteArray, monitors);
+    QFETCH(Screens, screens);
     QFETCH(QString, expected);
     QFETCH(int, spanIndex);
+    if (!monitors.isNull())
+        qputenv("TESSEL_MONITORS", monitors);
     sScreens = screens;
     std::vector<DisplayInfo> displays;
-    bool fromEnvironment = true;
+    bool fromEnvironment = monitors.isNull();
     const int count = ZuDesktop::getDisplayInfo(displays, &fromEnvironment);
     QCOMPARE(count, int(displays.size()));
     QCOMPARE(describe(displays), expected);
-    QCOMPARE(fromEnvironment, false);
+    // Untouched when nothing was found.
+    QCOMPARE(fromEnvironment, displays.empty() ? monitors.isNull() : !monitors.isNull());
     QCOMPARE(ZuDesktop::Internal::spanIndex(), spanIndex);
 
     int x = -1, y = -1, w = -1, h = -1;
@@ -200,68 +148,53 @@ void TestDesktop::windowSystem()
     }
 }
 
-void TestDesktop::windowSystemSortsExisting()
+void TestDesktop::appendsToExisting()
 {
-    sScreens = {screen(0, 0, 1920, 1200)};
+    // From the environment: placed after the entry that was there, not primary, its span kept.
+    qputenv("TESSEL_MONITORS", "640x480");
     std::vector<DisplayInfo> displays(1);
-    displays[0].x = 5000;
-    displays[0].w = 100;
-    displays[0].h = 100;
+    displays[0].x = 100;
+    displays[0].w = 300;
+    displays[0].span = true;
     QCOMPARE(ZuDesktop::getDisplayInfo(displays, nullptr), 2);
-    QCOMPARE(describe(displays),
-             QStringLiteral("0,0,1920,1200/0,0,1920,1200 P; 5000,0,100,100/0,0,0,0"));
-}
-
-void TestDesktop::noScreens()
-{
-    sScreens = {screen(0, 0, 3840, 1200)};
-    std::vector<DisplayInfo> displays;
-    ZuDesktop::getDisplayInfo(displays, nullptr);
+    QCOMPARE(describe({displays[1]}), QStringLiteral("400,0,640x480"));
     QCOMPARE(ZuDesktop::Internal::spanIndex(), 0);
 
-    // Nothing reported: nothing appended, nothing else changed.
-    sScreens.clear();
-    std::vector<DisplayInfo> more(2);
+    // The window system reports nothing: nothing appended, nothing else changed.
+    qunsetenv("TESSEL_MONITORS");
     bool fromEnvironment = true;
-    QCOMPARE(ZuDesktop::getDisplayInfo(more, &fromEnvironment), 2);
-    QCOMPARE(fromEnvironment, true);
+    QCOMPARE(ZuDesktop::getDisplayInfo(displays, &fromEnvironment), 2);
+    QVERIFY(fromEnvironment);
     QCOMPARE(ZuDesktop::Internal::spanIndex(), 0);
-    int cx = 7, cy = 7;
-    QVERIFY(!ZuDesktop::getRelCenteredDisplayPos(10, 10, 10, 10, cx, cy));
-    QCOMPARE(cx, 7);
+
+    // From the window system: sorted together with the entry that was there.
+    sScreens = {screen(0, 0, 1920, 1200)};
+    displays.assign(1, DisplayInfo());
+    displays[0].x = 5000;
+    displays[0].w = displays[0].h = 100;
+    QCOMPARE(ZuDesktop::getDisplayInfo(displays, nullptr), 2);
+    QCOMPARE(describe(displays), QStringLiteral("0,0,1920x1200 P; 5000,0,100x100/0,0,0x0"));
 }
 
 void TestDesktop::placement()
 {
     qputenv("TESSEL_MONITORS", "1920x1080-1920+0 1920x1080 1280x1024");
-    int cx = -1, cy = -1;
-    QVERIFY(ZuDesktop::getRelCenteredDisplayPos(100, 100, 400, 300, cx, cy));
-    QCOMPARE(QPoint(cx, cy), QPoint(960, 540));
-    QVERIFY(ZuDesktop::getRelCenteredDisplayPos(-1000, 1, 10, 10, cx, cy));
-    QCOMPARE(QPoint(cx, cy), QPoint(-960, 540));
-    QVERIFY(ZuDesktop::getRelCenteredDisplayPos(3000, 500, 100, 100, cx, cy));
-    QCOMPARE(QPoint(cx, cy), QPoint(1920 + 640, 512));
-
-    // Touching an edge, or reaching the last row/column, finds no monitor.
-    cx = cy = 42;
-    QVERIFY(!ZuDesktop::getRelCenteredDisplayPos(0, 100, 10, 10, cx, cy));
-    QVERIFY(!ZuDesktop::getRelCenteredDisplayPos(100, 0, 10, 10, cx, cy));
-    QVERIFY(!ZuDesktop::getRelCenteredDisplayPos(100, 100, 1820, 10, cx, cy));
-    QVERIFY(!ZuDesktop::getRelCenteredDisplayPos(-100, 100, 200, 10, cx, cy)); // straddles
-    QCOMPARE(QPoint(cx, cy), QPoint(42, 42));
-}
-
-void TestDesktop::realScreen()
-{
-    // The offscreen platform's one screen, through QGuiApplication.
-    ZuDesktop::Internal::setScreenSource(nullptr);
-    QScreen* primary = QGuiApplication::primaryScreen();
-    QVERIFY(primary);
-    std::vector<DisplayInfo> displays;
-    QCOMPARE(ZuDesktop::getDisplayInfo(displays, nullptr), QGuiApplication::screens().size());
-    QCOMPARE(displays[0].w, primary->geometry().width());
-    QCOMPARE(displays[0].h, primary->geometry().height());
-    QVERIFY(displays[0].isPrimary);
+    const QList<QRect> found = {QRect(100, 100, 400, 300), QRect(-1000, 1, 10, 10),
+                                QRect(3000, 500, 100, 100)};
+    const QList<QPoint> centres = {QPoint(960, 540), QPoint(-960, 540), QPoint(1920 + 640, 512)};
+    for (int i = 0; i < found.size(); ++i) {
+        const QRect r = found[i];
+        int cx = -1, cy = -1;
+        QVERIFY(ZuDesktop::getRelCenteredDisplayPos(r.x(), r.y(), r.width(), r.height(), cx, cy));
+        QCOMPARE(QPoint(cx, cy), centres[i]);
+    }
+    // Touching an edge, reaching the last row/column or straddling finds no monitor.
+    for (const QRect& r : {QRect(0, 100, 10, 10), QRect(100, 0, 10, 10), QRect(100, 100, 1820, 10),
+                           QRect(-100, 100, 200, 10)}) {
+        int cx = 42, cy = 42;
+        QVERIFY(!ZuDesktop::getRelCenteredDisplayPos(r.x(), r.y(), r.width(), r.height(), cx, cy));
+        QCOMPARE(QPoint(cx, cy), QPoint(42, 42));
+    }
 }
 
 void TestDesktop::debugDump()
@@ -273,10 +206,10 @@ void TestDesktop::debugDump()
     QCOMPARE(capture.texts().size(), size_t(0)); // off by default
 
     ZuDesktop::setDebugDumpEnabled(true);
-    std::vector<DisplayInfo> dumped;
-    ZuDesktop::getDisplayInfo(dumped, nullptr);
-    std::vector<DisplayInfo> again;
-    ZuDesktop::getDisplayInfo(again, nullptr); // written once only
+    for (int i = 0; i < 2; ++i) { // written once only
+        displays.clear();
+        ZuDesktop::getDisplayInfo(displays, nullptr);
+    }
     const std::vector<std::string> expected = {
         "\ngetDisplayInfo()\n{",
         "\n  source: TESSEL_MONITORS [800x600+0+0,800x600]",

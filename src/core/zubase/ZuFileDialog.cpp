@@ -46,14 +46,24 @@ int ZuFileDialog::exec()
     return result;
 }
 
+namespace {
+
+// Runs one of QFileDialog's static functions with the probe on and the default parent.
+template <typename Function, typename... Args>
+auto runWithProbe(Function inFunction, QWidget* inParent, const Args&... inArgs)
+{
+    ProbeScope probe;
+    return inFunction(ZuTopLevelWidgetWrapperHelper::parentOrDefault(inParent), inArgs...);
+}
+
+} // namespace
+
 QString ZuFileDialog::getOpenFileName(QWidget* inParent, const QString& inCaption,
                                       const QString& inDirectory, const QString& inFilter,
                                       QString* outSelectedFilter, QFileDialog::Options inOptions)
 {
-    ProbeScope probe;
-    return QFileDialog::getOpenFileName(ZuTopLevelWidgetWrapperHelper::parentOrDefault(inParent),
-                                        inCaption, inDirectory, inFilter, outSelectedFilter,
-                                        inOptions);
+    return runWithProbe(&QFileDialog::getOpenFileName, inParent, inCaption, inDirectory, inFilter,
+                        outSelectedFilter, inOptions);
 }
 
 QStringList ZuFileDialog::getOpenFileNames(QWidget* inParent, const QString& inCaption,
@@ -61,28 +71,22 @@ QStringList ZuFileDialog::getOpenFileNames(QWidget* inParent, const QString& inC
                                            QString* outSelectedFilter,
                                            QFileDialog::Options inOptions)
 {
-    ProbeScope probe;
-    return QFileDialog::getOpenFileNames(ZuTopLevelWidgetWrapperHelper::parentOrDefault(inParent),
-                                         inCaption, inDirectory, inFilter, outSelectedFilter,
-                                         inOptions);
+    return runWithProbe(&QFileDialog::getOpenFileNames, inParent, inCaption, inDirectory, inFilter,
+                        outSelectedFilter, inOptions);
 }
 
 QString ZuFileDialog::getSaveFileName(QWidget* inParent, const QString& inCaption,
                                       const QString& inDirectory, const QString& inFilter,
                                       QString* outSelectedFilter, QFileDialog::Options inOptions)
 {
-    ProbeScope probe;
-    return QFileDialog::getSaveFileName(ZuTopLevelWidgetWrapperHelper::parentOrDefault(inParent),
-                                        inCaption, inDirectory, inFilter, outSelectedFilter,
-                                        inOptions);
+    return runWithProbe(&QFileDialog::getSaveFileName, inParent, inCaption, inDirectory, inFilter,
+                        outSelectedFilter, inOptions);
 }
 
 QString ZuFileDialog::getExistingDirectory(QWidget* inParent, const QString& inCaption,
                                            const QString& inDirectory,
                                            QFileDialog::Options inOptions)
 {
-    ProbeScope probe;
-    return QFileDialog::getExistingDirectory(
-        ZuTopLevelWidgetWrapperHelper::parentOrDefault(inParent), inCaption, inDirectory,
-        inOptions);
+    return runWithProbe(&QFileDialog::getExistingDirectory, inParent, inCaption, inDirectory,
+                        inOptions);
 }

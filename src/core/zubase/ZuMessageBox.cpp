@@ -12,17 +12,24 @@
 
 namespace {
 
+void setUpBox(ZuMessageBox& inBox, QMessageBox::Icon inIcon, const QString& inTitle,
+              const QString& inText, QMessageBox::StandardButtons inButtons,
+              QMessageBox::StandardButton inDefaultButton)
+{
+    inBox.setIcon(inIcon);
+    inBox.setWindowTitle(inTitle.isEmpty() ? QCoreApplication::applicationName() : inTitle);
+    inBox.setText(inText);
+    inBox.setStandardButtons(inButtons);
+    inBox.setDefaultButton(inDefaultButton);
+}
+
 QMessageBox::StandardButton showBox(QMessageBox::Icon inIcon, QWidget* inParent,
                                     const QString& inTitle, const QString& inText,
                                     QMessageBox::StandardButtons inButtons,
                                     QMessageBox::StandardButton inDefaultButton)
 {
     ZuMessageBox box(inParent);
-    box.setIcon(inIcon);
-    box.setWindowTitle(inTitle.isEmpty() ? QCoreApplication::applicationName() : inTitle);
-    box.setText(inText);
-    box.setStandardButtons(inButtons);
-    box.setDefaultButton(inDefaultButton);
+    setUpBox(box, inIcon, inTitle, inText, inButtons, inDefaultButton);
     return QMessageBox::StandardButton(box.exec());
 }
 
@@ -74,75 +81,35 @@ int ZuMessageBox::exec()
     return ZuTopLevelWidgetWrapper<QMessageBox>::exec();
 }
 
-QMessageBox::StandardButton ZuMessageBox::critical(QWidget* inParent, const QString& inTitle,
-                                                   const QString& inText,
-                                                   QMessageBox::StandardButtons inButtons,
-                                                   QMessageBox::StandardButton inDefaultButton)
-{
-    return showBox(QMessageBox::Critical, inParent, inTitle, inText, inButtons, inDefaultButton);
-}
+// Both forms of one box kind; the form without a parent takes the default parent and the
+// application name as title.
+#define ZU_MESSAGEBOX_KIND(inName, inIcon)                                                         \
+    QMessageBox::StandardButton ZuMessageBox::inName(                                              \
+        QWidget* inParent, const QString& inTitle, const QString& inText,                          \
+        QMessageBox::StandardButtons inButtons, QMessageBox::StandardButton inDefaultButton)       \
+    {                                                                                              \
+        return showBox(inIcon, inParent, inTitle, inText, inButtons, inDefaultButton);             \
+    }                                                                                              \
+    QMessageBox::StandardButton ZuMessageBox::inName(const QString& inText,                        \
+                                                     QMessageBox::StandardButtons inButtons,       \
+                                                     QMessageBox::StandardButton inDefaultButton)  \
+    {                                                                                              \
+        return showBox(inIcon, nullptr, QString(), inText, inButtons, inDefaultButton);            \
+    }
 
-QMessageBox::StandardButton ZuMessageBox::critical(const QString& inText,
-                                                   QMessageBox::StandardButtons inButtons,
-                                                   QMessageBox::StandardButton inDefaultButton)
-{
-    return showBox(QMessageBox::Critical, nullptr, QString(), inText, inButtons, inDefaultButton);
-}
+ZU_MESSAGEBOX_KIND(critical, QMessageBox::Critical)
+ZU_MESSAGEBOX_KIND(information, QMessageBox::Information)
+ZU_MESSAGEBOX_KIND(question, QMessageBox::Question)
+ZU_MESSAGEBOX_KIND(warning, QMessageBox::Warning)
 
-QMessageBox::StandardButton ZuMessageBox::information(QWidget* inParent, const QString& inTitle,
-                                                      const QString& inText,
-                                                      QMessageBox::StandardButtons inButtons,
-                                                      QMessageBox::StandardButton inDefaultButton)
-{
-    return showBox(QMessageBox::Information, inParent, inTitle, inText, inButtons, inDefaultButton);
-}
-
-QMessageBox::StandardButton ZuMessageBox::information(const QString& inText,
-                                                      QMessageBox::StandardButtons inButtons,
-                                                      QMessageBox::StandardButton inDefaultButton)
-{
-    return showBox(QMessageBox::Information, nullptr, QString(), inText, inButtons,
-                   inDefaultButton);
-}
-
-QMessageBox::StandardButton ZuMessageBox::question(QWidget* inParent, const QString& inTitle,
-                                                   const QString& inText,
-                                                   QMessageBox::StandardButtons inButtons,
-                                                   QMessageBox::StandardButton inDefaultButton)
-{
-    return showBox(QMessageBox::Question, inParent, inTitle, inText, inButtons, inDefaultButton);
-}
-
-QMessageBox::StandardButton ZuMessageBox::question(const QString& inText,
-                                                   QMessageBox::StandardButtons inButtons,
-                                                   QMessageBox::StandardButton inDefaultButton)
-{
-    return showBox(QMessageBox::Question, nullptr, QString(), inText, inButtons, inDefaultButton);
-}
-
-QMessageBox::StandardButton ZuMessageBox::warning(QWidget* inParent, const QString& inTitle,
-                                                  const QString& inText,
-                                                  QMessageBox::StandardButtons inButtons,
-                                                  QMessageBox::StandardButton inDefaultButton)
-{
-    return showBox(QMessageBox::Warning, inParent, inTitle, inText, inButtons, inDefaultButton);
-}
-
-QMessageBox::StandardButton ZuMessageBox::warning(const QString& inText,
-                                                  QMessageBox::StandardButtons inButtons,
-                                                  QMessageBox::StandardButton inDefaultButton)
-{
-    return showBox(QMessageBox::Warning, nullptr, QString(), inText, inButtons, inDefaultButton);
-}
+#undef ZU_MESSAGEBOX_KIND
 
 bool ZuMessageBox::overwrite(QWidget* inParent, const QString& inFileName)
 {
     ZuMessageBox box(inParent);
-    box.setIcon(QMessageBox::Information);
-    box.setWindowTitle(QCoreApplication::applicationName());
-    box.setText(QCoreApplication::translate("DvMessage", "%1 already exists.").arg(inFileName));
-    box.setStandardButtons(QMessageBox::Ok | QMessageBox::Cancel);
-    box.setDefaultButton(QMessageBox::Cancel);
+    setUpBox(box, QMessageBox::Information, QString(),
+             QCoreApplication::translate("DvMessage", "%1 already exists.").arg(inFileName),
+             QMessageBox::Ok | QMessageBox::Cancel, QMessageBox::Cancel);
     box.button(QMessageBox::Ok)->setText(tr("Overwrite"));
     return box.exec() == QMessageBox::Ok;
 }

@@ -21,37 +21,27 @@ public:
     // The label that shows the text; null when there is none.
     QLabel* findLabel() const;
 
-    static QMessageBox::StandardButton
-    critical(QWidget* inParent, const QString& inTitle, const QString& inText,
-             QMessageBox::StandardButtons inButtons = QMessageBox::Ok,
-             QMessageBox::StandardButton inDefaultButton = QMessageBox::NoButton);
-    static QMessageBox::StandardButton
-    critical(const QString& inText, QMessageBox::StandardButtons inButtons = QMessageBox::Ok,
-             QMessageBox::StandardButton inDefaultButton = QMessageBox::NoButton);
-    static QMessageBox::StandardButton
-    information(QWidget* inParent, const QString& inTitle, const QString& inText,
-                QMessageBox::StandardButtons inButtons = QMessageBox::Ok,
-                QMessageBox::StandardButton inDefaultButton = QMessageBox::NoButton);
-    static QMessageBox::StandardButton
-    information(const QString& inText, QMessageBox::StandardButtons inButtons = QMessageBox::Ok,
-                QMessageBox::StandardButton inDefaultButton = QMessageBox::NoButton);
-    static QMessageBox::StandardButton question(
-        QWidget* inParent, const QString& inTitle, const QString& inText,
-        QMessageBox::StandardButtons inButtons = QMessageBox::StandardButtons(QMessageBox::Yes |
-                                                                              QMessageBox::No),
-        QMessageBox::StandardButton inDefaultButton = QMessageBox::NoButton);
-    static QMessageBox::StandardButton question(
-        const QString& inText,
-        QMessageBox::StandardButtons inButtons = QMessageBox::StandardButtons(QMessageBox::Yes |
-                                                                              QMessageBox::No),
-        QMessageBox::StandardButton inDefaultButton = QMessageBox::NoButton);
-    static QMessageBox::StandardButton
-    warning(QWidget* inParent, const QString& inTitle, const QString& inText,
-            QMessageBox::StandardButtons inButtons = QMessageBox::Ok,
-            QMessageBox::StandardButton inDefaultButton = QMessageBox::NoButton);
-    static QMessageBox::StandardButton
-    warning(const QString& inText, QMessageBox::StandardButtons inButtons = QMessageBox::Ok,
-            QMessageBox::StandardButton inDefaultButton = QMessageBox::NoButton);
+    static StandardButton critical(QWidget* inParent, const QString& inTitle, const QString& inText,
+                                   StandardButtons inButtons = Ok,
+                                   StandardButton inDefaultButton = NoButton);
+    static StandardButton critical(const QString& inText, StandardButtons inButtons = Ok,
+                                   StandardButton inDefaultButton = NoButton);
+    static StandardButton information(QWidget* inParent, const QString& inTitle,
+                                      const QString& inText, StandardButtons inButtons = Ok,
+                                      StandardButton inDefaultButton = NoButton);
+    static StandardButton information(const QString& inText, StandardButtons inButtons = Ok,
+                                      StandardButton inDefaultButton = NoButton);
+    static StandardButton question(QWidget* inParent, const QString& inTitle, const QString& inText,
+                                   StandardButtons inButtons = StandardButtons(Yes | No),
+                                   StandardButton inDefaultButton = NoButton);
+    static StandardButton question(const QString& inText,
+                                   StandardButtons inButtons = StandardButtons(Yes | No),
+                                   StandardButton inDefaultButton = NoButton);
+    static StandardButton warning(QWidget* inParent, const QString& inTitle, const QString& inText,
+                                  StandardButtons inButtons = Ok,
+                                  StandardButton inDefaultButton = NoButton);
+    static StandardButton warning(const QString& inText, StandardButtons inButtons = Ok,
+                                  StandardButton inDefaultButton = NoButton);
 
     // Asks whether inFileName may be overwritten; true only for the Overwrite (Ok) button.
     static bool overwrite(QWidget* inParent, const QString& inFileName);
