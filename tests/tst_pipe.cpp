@@ -54,18 +54,13 @@ bool passes(ZuBase::Pipe& inServer, ZuBase::Pipe& inClient, const QByteArray& in
            inClient.read(got.data(), unsigned(got.size())).isOk() && got == inText;
 }
 
-// Both ends of one name; open() creates the server, connects the client, then accepts it.
+// Both ends of one name, neither open yet.
 struct Ends
 {
     explicit Ends(const QString& inName = uniqueName()) : name(inName)
     {
         server.nameSet(name);
         client.nameSet(name);
-    }
-    bool open()
-    {
-        return server.createOnServer().isOk() && client.connectOnClient().isOk() &&
-               server.acceptOnServer().isOk();
     }
     QString name;
     ZuBase::Pipe server{true};
@@ -83,12 +78,9 @@ private slots:
     void transferAcrossProcesses();
     void peerDiesMidTransfer_data();
     void peerDiesMidTransfer();
-    void clientFirstCountsAsConnected();
-    void acceptTimesOutWithoutClient();
+    void acceptStates();
     void oneInstanceAndReadOnlyClient();
-    void clientWaitsForServer();
     void noLiveServer();
-    void oneServerPerName();
     void foreignPeerReadsStream();
     void copiesShareOneHandle();
     void pipeServerAcceptsAndPaces();
@@ -184,29 +176,11 @@ void TestPipe::peerDiesMidTransfer()
     QVERIFY(peer.waitForFinished(5000));
 }
 
-void TestPipe::clientFirstCountsAsConnected()
-{
-    Ends ends; // the client connects before the server accepts
-    QVERIFY(ends.open());
-    QVERIFY(ends.server.isConnected());
-    QVERIFY(passes(ends.server, ends.client, "hello"));
-    // Further passes find the client connected at once.
-    QVERIFY(ends.server.acceptOnServer().isOk());
-    // After the client has gone the pipe cannot be used again: accepting fails at once.
-    ends.client.close();
-    RkLogCapture capture;
-    QElapsedTimer timer;
-    timer.start();
-    QVERIFY(ends.server.acceptOnServer().isBad());
-    QVERIFY(timer.elapsed() < 900);
-    QVERIFY(!ends.server.isConnected());
-    QVERIFY(capture.texts("Tz").empty());
-}
-
-void TestPipe::acceptTimesOutWithoutClient()
+void TestPipe::acceptStates()
 {
     Ends ends;
     QVERIFY(ends.server.createOnServer().isOk());
+    // No client: a bad result after the time-out, and nothing left pending.
     RkLogCapture capture;
     QElapsedTimer timer;
     timer.start();
@@ -215,44 +189,54 @@ void TestPipe::acceptTimesOutWithoutClient()
     QVERIFY(!ends.server.isConnected());
     QCOMPARE(capture.texts(),
              std::vector<std::string>{"::ConnectNamedPipe() [" + ends.name.toStdString() + "]"});
-    // Nothing was left pending: a client that comes later is accepted by the next pass.
+    // A client that connects before the next pass counts as connected.
     QVERIFY(ends.client.connectOnClient().isOk());
     QVERIFY(ends.server.acceptOnServer().isOk());
-    QVERIFY(passes(ends.server, ends.client, "x"));
+    QVERIFY(ends.server.isConnected());
+    QVERIFY(passes(ends.server, ends.client, "hello"));
+    // Further passes find the client connected at once.
+    QVERIFY(ends.server.acceptOnServer().isOk());
+    // After the client has gone the pipe cannot be used again: accepting fails at once.
+    ends.client.close();
+    capture.clear();
+    timer.restart();
+    QVERIFY(ends.server.acceptOnServer().isBad());
+    QVERIFY(timer.elapsed() < 900);
+    QVERIFY(!ends.server.isConnected());
+    QVERIFY(capture.texts("Tz").empty());
 }
 
 void TestPipe::oneInstanceAndReadOnlyClient()
 {
     Ends ends;
-    QVERIFY(ends.open());
+    QVERIFY(ends.server.createOnServer().isOk());
+    // Creating again replaces our own server end instead of competing with it.
+    QVERIFY(ends.server.createOnServer().isOk());
+    QVERIFY(ends.client.connectOnClient().isOk());
+    QVERIFY(ends.server.acceptOnServer().isOk());
     RkLogCapture capture;
-    // A second client is refused with a record.
-    ZuBase::Pipe second(false);
-    second.nameSet(ends.name);
-    QVERIFY(second.connectOnClient().isBad());
-    QVERIFY(!second.isConnected());
+    // A second server and a second client are refused with a record.
+    ZuBase::Pipe secondServer(true), secondClient(false);
+    secondServer.nameSet(ends.name);
+    secondClient.nameSet(ends.name);
+    QVERIFY(secondServer.createOnServer().isBad());
+    QVERIFY(!secondServer.isCreated());
+    QVERIFY(secondClient.connectOnClient().isBad());
+    QVERIFY(!secondClient.isConnected());
     // The client end cannot write.
     QVERIFY(ends.client.write("abc", 3).isBad());
     QCOMPARE(
         failureLines(capture),
-        QStringList({sWhere + "connectOnClient: ::CreateFile  val[-1]  notexp[-1]",
+        QStringList({sWhere + "createOnServer: ::CreateNamedPipe  val[-1]  notexp[-1]",
+                     "last error 98: Address already in use",
+                     sWhere + "connectOnClient: ::CreateFile  val[-1]  notexp[-1]",
                      "last error 16: Device or resource busy",
                      sWhere + "write: ::WriteFile  cond[b]", "last error 9: Bad file descriptor"}));
-    // Neither disturbs the connected pair.
+    // None of that disturbs the connected pair.
     QVERIFY(passes(ends.server, ends.client, "abc"));
-}
-
-void TestPipe::clientWaitsForServer()
-{
-    Ends ends;
-    RkResult res;
-    std::thread connecting([&] { res = ends.client.connectOnClient(); });
-    QTest::qWait(300);
-    QVERIFY(ends.server.createOnServer().isOk());
-    connecting.join();
-    QVERIFY(res.isOk());
-    QVERIFY(ends.client.isConnected());
-    QVERIFY(ends.server.acceptOnServer().isOk());
+    // Once the first server has closed, the name is free again.
+    ends.server.close();
+    QVERIFY(secondServer.createOnServer().isOk());
 }
 
 void TestPipe::noLiveServer()
@@ -272,29 +256,18 @@ void TestPipe::noLiveServer()
     QVERIFY(!ends.client.isConnected());
     QVERIFY(!ends.client.isCreated());
     QVERIFY(capture.texts("Tz").empty());
-    // ... and a new server takes the name over, and removes the socket when it closes.
-    QVERIFY(ends.open());
+    // ... while a client that waits for a server gets the new one, which takes the name over
+    // and removes the socket when it closes.
+    RkResult res;
+    std::thread connecting([&] { res = ends.client.connectOnClient(); });
+    QTest::qWait(300);
+    QVERIFY(ends.server.createOnServer().isOk());
+    connecting.join();
+    QVERIFY(res.isOk());
+    QVERIFY(ends.client.isConnected());
+    QVERIFY(ends.server.acceptOnServer().isOk());
     ends.server.close();
     QVERIFY(!QFile::exists(socketPath(ends.name)));
-}
-
-void TestPipe::oneServerPerName()
-{
-    Ends ends;
-    QVERIFY(ends.server.createOnServer().isOk());
-    // Creating again replaces our own server end instead of competing with it.
-    QVERIFY(ends.server.createOnServer().isOk());
-    RkLogCapture capture;
-    ZuBase::Pipe second(true);
-    second.nameSet(ends.name);
-    QVERIFY(second.createOnServer().isBad());
-    QVERIFY(!second.isCreated());
-    QCOMPARE(failureLines(capture),
-             QStringList({sWhere + "createOnServer: ::CreateNamedPipe  val[-1]  notexp[-1]",
-                          "last error 98: Address already in use"}));
-    // Once the first has closed, the name is free again.
-    ends.server.close();
-    QVERIFY(second.createOnServer().isOk());
 }
 
 void TestPipe::foreignPeerReadsStream()

@@ -463,23 +463,21 @@ void TestProcess::elevationInformation()
 {
     // userIsAdmin() prints its line on the first call only: catch standard output.
     std::fflush(stdout);
-    const QString capturePath = mTemp.filePath("stdout");
     const int saved = dup(STDOUT_FILENO);
-    FILE* file = std::fopen(capturePath.toLocal8Bit().constData(), "w");
-    QVERIFY(file);
-    dup2(fileno(file), STDOUT_FILENO);
+    QFile out(mTemp.filePath("stdout"));
+    QVERIFY(out.open(QIODevice::WriteOnly));
+    dup2(out.handle(), STDOUT_FILENO);
     const bool admin = ZuBase::Process::userIsAdmin();
     const bool again = ZuBase::Process::userIsAdmin();
     std::fflush(stdout);
     dup2(saved, STDOUT_FILENO);
     close(saved);
-    std::fclose(file);
+    out.close();
 
     const bool elevated = ZuBase::Process::elevated();
     QCOMPARE(elevated, geteuid() == 0);
     QCOMPARE(again, admin);
     QVERIFY(admin || !elevated);
-    QFile out(capturePath);
     QVERIFY(out.open(QIODevice::ReadOnly));
     QCOMPARE(out.readAll(), QStringLiteral("\nelevationInfo() elev %1  admin %2\n")
                                 .arg(int(elevated))
