@@ -89,6 +89,26 @@ QString normalisedModulePath(const QString& inPath)
     return QDir::toNativeSeparators(QFileInfo(inPath).canonicalFilePath().toLower());
 }
 
+// A process handle that is closed when the call that opened it returns.
+struct ProcessHandle
+{
+    ~ProcessHandle()
+    {
+        if (value != 0)
+            ZuPlatform::closeHandle(value);
+    }
+    ZuPlatform::Handle value = 0;
+};
+
+// A process that cannot be opened gives a bad result without a record.
+RkResult openResult(int inError)
+{
+    RkResult res;
+    if (inError != 0)
+        res.makeBad(1);
+    return res;
+}
+
 } // namespace
 
 void (*Process::sExitCallback)(int, QString) = nullptr;
@@ -170,18 +190,7 @@ RkResult Process::start(bool inElevate, bool inInheritEnvironment, bool)
 
     log.printf("CreateProcess(): success pid[%d]", static_cast<int>(creation.processId));
     mProcessId = creation.processId;
-    if (isRunning()) {
-        if (!mPollArmed) {
-            mPollArmed = true;
-            QTimer::singleShot(sPollInterval, this, [this] {
-                mPollArmed = false;
-                checkRunning();
-            });
-        }
-    } else {
-        mTerminatedEmitted = true;
-        emit terminated();
-    }
+    checkRunning(); // starts the polling, or reports a child that has ended already
     return res;
 }
 
@@ -290,39 +299,33 @@ void Process::closeHandles()
 
 RkResult Process::imageFilePath(QString& outPath)
 {
-    RkResult res;
     outPath.clear();
-    ZuPlatform::Handle process = 0;
-    if (openWatched(false, process) != 0) {
-        res.makeBad(1);
+    ProcessHandle process;
+    RkResult res = openResult(openWatched(false, process.value));
+    if (res.isBad())
         return res;
-    }
     std::string path;
-    const int error = ZuPlatform::processImageFileName(process, path);
+    const int error = ZuPlatform::processImageFileName(process.value, path);
     const std::size_t len = error == 0 ? path.size() : 0;
     if (Tz::failWin(RK_CHECK(len > 0, "len>0", "Internal Error"), error))
         res.makeBad(1);
     else
         outPath = fileName(path);
-    ZuPlatform::closeHandle(process);
     return res;
 }
 
 RkResult Process::modules(QStringList& outPaths)
 {
-    RkResult res;
     outPaths.clear();
-    ZuPlatform::Handle process = 0;
-    if (openWatched(false, process) != 0) {
-        res.makeBad(1);
+    ProcessHandle process;
+    RkResult res = openResult(openWatched(false, process.value));
+    if (res.isBad())
         return res;
-    }
     std::vector<std::string> paths;
-    const int error = ZuPlatform::processModules(process, paths);
+    const int error = ZuPlatform::processModules(process.value, paths);
     const bool bret = error == 0;
     if (Tz::failWin(RK_CHECK(bret != 0, "bret!=0", "Internal Error"), error)) {
         res.makeBad(1);
-        ZuPlatform::closeHandle(process);
         return res;
     }
     for (const std::string& path : paths) {
@@ -331,7 +334,6 @@ RkResult Process::modules(QStringList& outPaths)
             continue;
         outPaths << fileName(path);
     }
-    ZuPlatform::closeHandle(process);
     return res;
 }
 

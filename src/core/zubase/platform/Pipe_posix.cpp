@@ -1,11 +1,12 @@
 // POSIX backend of the pipe platform layer: Unix-domain stream sockets.
 #include "zubase/platform/Pipe.h"
 
+#include "zubase/platform/HandleTable.h"
+
 #include <atomic>
 #include <cerrno>
 #include <chrono>
 #include <cstring>
-#include <map>
 #include <memory>
 #include <mutex>
 #include <thread>
@@ -43,35 +44,17 @@ struct PipeObject
     std::string lockPath;
 };
 
-struct Table
+HandleTable<std::shared_ptr<PipeObject>>& table()
 {
-    std::mutex mutex;
-    std::map<PipeHandle, std::shared_ptr<PipeObject>> pipes;
-    PipeHandle next = 0x1000;
-};
-
-Table& table()
-{
-    static Table* const instance = new Table;
+    static auto* const instance = new HandleTable<std::shared_ptr<PipeObject>>(0x1000);
     return *instance;
 }
 
 std::shared_ptr<PipeObject> find(PipeHandle inPipe)
 {
-    Table& t = table();
-    std::lock_guard<std::mutex> lock(t.mutex);
-    const auto found = t.pipes.find(inPipe);
-    return found == t.pipes.end() ? nullptr : found->second;
-}
-
-PipeHandle add(std::shared_ptr<PipeObject> inObject)
-{
-    Table& t = table();
-    std::lock_guard<std::mutex> lock(t.mutex);
-    const PipeHandle handle = t.next;
-    t.next += 4;
-    t.pipes[handle] = std::move(inObject);
-    return handle;
+    std::shared_ptr<PipeObject> object;
+    table().find(inPipe, object);
+    return object;
 }
 
 // A directory of our own: it exists, is no link, belongs to us and nobody else may enter it.
@@ -245,7 +228,7 @@ int createNamedPipe(const std::string& inSystemName, PipeHandle& outPipe)
         unlink(object->lockPath.c_str());
         return error;
     }
-    outPipe = add(std::move(object));
+    outPipe = table().add(std::move(object));
     return 0;
 }
 
@@ -317,57 +300,52 @@ int openNamedPipeForReading(const std::string& inSystemName, PipeHandle& outPipe
     }
     if (fcntl(fd, F_SETFL, fcntl(fd, F_GETFL) & ~O_NONBLOCK) != 0)
         return errno;
-    outPipe = add(std::move(object));
+    outPipe = table().add(std::move(object));
     return 0;
 }
 
-int readPipe(PipeHandle inPipe, void* outBuffer, unsigned inSize, unsigned& outRead)
+namespace {
+
+// One transfer on the connected descriptor, repeated when a signal interrupts it. The object
+// keeps the descriptor open while inCall runs.
+template <typename Call>
+int transfer(PipeHandle inPipe, bool inWriting, unsigned inSize, unsigned& outDone, Call inCall)
 {
-    outRead = 0;
+    outDone = 0;
     const std::shared_ptr<PipeObject> object = find(inPipe);
-    if (!object)
-        return EBADF;
+    if (!object || (inWriting && !object->server))
+        return EBADF; // also a write on the client end, which is opened for reading only
     const int fd = object->connFd;
     if (fd < 0)
         return ENOTCONN;
     if (inSize == 0)
         return 0;
     for (;;) {
-        const ssize_t got = recv(fd, outBuffer, inSize, 0);
-        if (got > 0) {
-            outRead = static_cast<unsigned>(got);
+        const ssize_t done = inCall(fd);
+        if (done > 0 || (done == 0 && inWriting)) {
+            outDone = static_cast<unsigned>(done);
             return 0;
         }
-        if (got == 0)
+        if (done == 0)
             return EPIPE; // the writer has gone
         if (errno != EINTR)
             return errno;
     }
 }
 
+} // namespace
+
+int readPipe(PipeHandle inPipe, void* outBuffer, unsigned inSize, unsigned& outRead)
+{
+    return transfer(inPipe, false, inSize, outRead,
+                    [&](int inFd) { return recv(inFd, outBuffer, inSize, 0); });
+}
+
 int writePipe(PipeHandle inPipe, const void* inBuffer, unsigned inSize, unsigned& outWritten)
 {
-    outWritten = 0;
-    const std::shared_ptr<PipeObject> object = find(inPipe);
-    if (!object)
-        return EBADF;
-    if (!object->server)
-        return EBADF; // the client end is opened for reading only
-    const int fd = object->connFd;
-    if (fd < 0)
-        return ENOTCONN;
-    if (inSize == 0)
-        return 0;
-    for (;;) {
-        // MSG_NOSIGNAL: a reader that has gone is an error code, not SIGPIPE.
-        const ssize_t sent = send(fd, inBuffer, inSize, MSG_NOSIGNAL);
-        if (sent >= 0) {
-            outWritten = static_cast<unsigned>(sent);
-            return 0;
-        }
-        if (errno != EINTR)
-            return errno;
-    }
+    // MSG_NOSIGNAL: a reader that has gone is an error code, not SIGPIPE.
+    return transfer(inPipe, true, inSize, outWritten,
+                    [&](int inFd) { return send(inFd, inBuffer, inSize, MSG_NOSIGNAL); });
 }
 
 int flushPipe(PipeHandle inPipe)
@@ -379,15 +357,8 @@ int flushPipe(PipeHandle inPipe)
 int closePipe(PipeHandle inPipe)
 {
     std::shared_ptr<PipeObject> object;
-    {
-        Table& t = table();
-        std::lock_guard<std::mutex> lock(t.mutex);
-        const auto found = t.pipes.find(inPipe);
-        if (found == t.pipes.end())
-            return EBADF;
-        object = found->second;
-        t.pipes.erase(found);
-    }
+    if (!table().take(inPipe, object))
+        return EBADF;
     object->closed = true;
     // Wake a transfer or an accept blocked in another thread; the descriptors close with the
     // last user. Data already sent stays readable for the peer.

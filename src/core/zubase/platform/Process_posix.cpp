@@ -2,6 +2,8 @@
 // children, /proc for listings, pkexec for elevation.
 #include "zubase/platform/Process.h"
 
+#include "zubase/platform/HandleTable.h"
+
 #include <algorithm>
 #include <cerrno>
 #include <chrono>
@@ -55,51 +57,35 @@ struct HandleEntry
     std::shared_ptr<Child> child; // null for a process that is not our child
 };
 
-struct Tables
+HandleTable<HandleEntry>& handles()
 {
-    std::mutex mutex;
-    std::map<Handle, HandleEntry> handles;
-    std::map<pid_t, std::weak_ptr<Child>> children;
-    Handle next = 0x100;
-};
-
-Tables& tables()
-{
-    static Tables* const instance = new Tables;
+    static auto* const instance = new HandleTable<HandleEntry>(0x100);
     return *instance;
 }
 
-Handle addHandle(const HandleEntry& inEntry)
+// Our children by process id, as long as a handle or the reaper still holds them.
+struct Children
 {
-    Tables& t = tables();
-    std::lock_guard<std::mutex> lock(t.mutex);
-    const Handle handle = t.next;
-    t.next += 4;
-    t.handles[handle] = inEntry;
-    return handle;
-}
+    std::mutex mutex;
+    std::map<pid_t, std::weak_ptr<Child>> byPid;
+};
 
-bool findHandle(Handle inHandle, HandleEntry& outEntry)
+Children& children()
 {
-    Tables& t = tables();
-    std::lock_guard<std::mutex> lock(t.mutex);
-    const auto found = t.handles.find(inHandle);
-    if (found == t.handles.end())
-        return false;
-    outEntry = found->second;
-    return true;
+    static Children* const instance = new Children;
+    return *instance;
 }
 
 std::shared_ptr<Child> findChild(pid_t inPid)
 {
-    Tables& t = tables();
-    std::lock_guard<std::mutex> lock(t.mutex);
-    const auto found = t.children.find(inPid);
-    if (found == t.children.end())
+    Children& c = children();
+    std::lock_guard<std::mutex> lock(c.mutex);
+    const auto found = c.byPid.find(inPid);
+    if (found == c.byPid.end())
         return nullptr;
     std::shared_ptr<Child> child = found->second.lock();
     if (!child)
-        t.children.erase(found);
+        c.byPid.erase(found);
     return child;
 }
 
@@ -135,9 +121,9 @@ std::shared_ptr<Child> adoptChild(pid_t inPid, bool inSuspended)
     auto child = std::make_shared<Child>(inPid);
     child->suspended = inSuspended;
     {
-        Tables& t = tables();
-        std::lock_guard<std::mutex> lock(t.mutex);
-        t.children[inPid] = child;
+        Children& c = children();
+        std::lock_guard<std::mutex> lock(c.mutex);
+        c.byPid[inPid] = child;
     }
     std::thread(reap, child).detach();
     return child;
@@ -421,9 +407,9 @@ int createProcessSuspended(const std::string& inCommandLine, const char* inEnvir
     HandleEntry entry;
     entry.pid = pid;
     entry.child = child;
-    outCreation.process = addHandle(entry);
+    outCreation.process = handles().add(entry);
     entry.thread = true;
-    outCreation.thread = addHandle(entry);
+    outCreation.thread = handles().add(entry);
     outCreation.processId = static_cast<unsigned>(pid);
     outCreation.threadId = static_cast<unsigned>(pid);
     return 0;
@@ -433,7 +419,7 @@ int resumeThread(Handle inThread, int& outPreviousCount)
 {
     outPreviousCount = 0;
     HandleEntry entry;
-    if (!findHandle(inThread, entry) || !entry.thread || !entry.child)
+    if (!handles().find(inThread, entry) || !entry.thread || !entry.child)
         return EBADF;
     std::lock_guard<std::mutex> lock(entry.child->mutex);
     if (!entry.child->suspended || entry.child->ended)
@@ -469,14 +455,14 @@ int openProcess(unsigned inProcessId, bool inFullAccess, Handle& outProcess)
             close(fd);
         }
     }
-    outProcess = addHandle(entry);
+    outProcess = handles().add(entry);
     return 0;
 }
 
 int exitCodeProcess(Handle inProcess, int& outExitCode)
 {
     HandleEntry entry;
-    if (!findHandle(inProcess, entry) || entry.thread)
+    if (!handles().find(inProcess, entry) || entry.thread)
         return EBADF;
     if (entry.child) {
         std::lock_guard<std::mutex> lock(entry.child->mutex);
@@ -505,7 +491,7 @@ int exitCodeProcess(Handle inProcess, int& outExitCode)
 int terminateProcess(Handle inProcess, int inExitCode)
 {
     HandleEntry entry;
-    if (!findHandle(inProcess, entry) || entry.thread)
+    if (!handles().find(inProcess, entry) || entry.thread)
         return EBADF;
     if (entry.child) {
         std::lock_guard<std::mutex> lock(entry.child->mutex);
@@ -524,9 +510,8 @@ int terminateProcess(Handle inProcess, int inExitCode)
 
 int closeHandle(Handle inHandle)
 {
-    Tables& t = tables();
-    std::lock_guard<std::mutex> lock(t.mutex);
-    return t.handles.erase(inHandle) ? 0 : EBADF;
+    HandleEntry closed;
+    return handles().take(inHandle, closed) ? 0 : EBADF;
 }
 
 int enumProcesses(std::vector<unsigned>& outIds)
@@ -549,7 +534,7 @@ int processModules(Handle inProcess, std::vector<std::string>& outPaths)
 {
     outPaths.clear();
     HandleEntry entry;
-    if (!findHandle(inProcess, entry) || entry.thread)
+    if (!handles().find(inProcess, entry) || entry.thread)
         return EBADF;
     std::ifstream maps(procPath(entry.pid, "maps"));
     if (!maps)
@@ -583,7 +568,7 @@ int processImageFileName(Handle inProcess, std::string& outPath)
 {
     outPath.clear();
     HandleEntry entry;
-    if (!findHandle(inProcess, entry) || entry.thread)
+    if (!handles().find(inProcess, entry) || entry.thread)
         return EBADF;
     char buffer[4096];
     const ssize_t length = readlink(procPath(entry.pid, "exe").c_str(), buffer, sizeof buffer);
