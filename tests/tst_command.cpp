@@ -1,9 +1,10 @@
 // Command-line commands: parsing, failure records, attribute access and usage texts.
 #include "zubase/Command.h"
 
+#include "TestSupport.h"
+
 #include "rklib/RkLogFile.h"
 
-#include <QRegularExpression>
 #include <QtTest>
 
 namespace {
@@ -57,15 +58,6 @@ RkResult upperCaseResolver(QString& ioText)
     return RkResult();
 }
 
-// The failure lines the log got, without their source line numbers.
-QStringList failureLines(const RkLogCapture& inCapture)
-{
-    QStringList lines;
-    for (const std::string& text : inCapture.texts("Tz"))
-        lines << QString::fromStdString(text).replace(QRegularExpression(R"(\(\d+\): )"), ": ");
-    return lines;
-}
-
 QString commandSummary(const RkDArray<RkHandle<ZuBase::Command>>& inCommands)
 {
     QStringList parts;
@@ -82,6 +74,8 @@ QString commandSummary(const RkDArray<RkHandle<ZuBase::Command>>& inCommands)
 }
 
 const QString sWhere = QStringLiteral("src/core/zubase/Command:ZuBase::Command::");
+
+using TestSupport::failureLines;
 
 } // namespace
 
