@@ -186,11 +186,9 @@ void TestImpersonation::groupFlags()
     QFETCH(uint, attributes);
     QFETCH(QString, flags);
     QCOMPARE(ZuBase::groupFlagsText(attributes), flags);
-    QCOMPARE(ZuBase::groupText("S-1-22-2-100", "Unix Group", "users", attributes),
-             "[S-1-22-2-100]  [Unix Group\\\\users]  [" + flags + "]");
-    QCOMPARE(ZuBase::privilegeText("SeDebugPrivilege", attributes),
-             "SeDebugPrivilege  [0x" + QString::number(attributes, 16) + "]");
-    QCOMPARE(ZuBase::privilegeText("SeBackupPrivilege", 3), QString("SeBackupPrivilege  [0x3]"));
+    // The dumps below show whole group lines; privileges in lower-case hex, unpadded.
+    QCOMPARE(ZuBase::privilegeText("SeBackupPrivilege", 0xE000001A),
+             QString("SeBackupPrivilege  [0xe000001a]"));
 }
 
 void TestImpersonation::tokenLogOfProcess()
