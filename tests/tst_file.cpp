@@ -122,8 +122,7 @@ void TestFile::readAll_data()
     QTest::addColumn<QByteArray>("content");
     QTest::addColumn<QString>("record");
 
-    QTest::newRow("text") << "a.txt" << QByteArray("hello\nworld") << QString();
-    QTest::newRow("binary") << "b.bin" << QByteArray("\0\1\2\xff", 4) << QString();
+    QTest::newRow("text and binary") << "a.bin" << QByteArray("hi\n\0\1\xff", 6) << QString();
     QTest::newRow("empty") << "c.txt" << QByteArray() << QString();
     QTest::newRow("missing") << "missing.txt" << QByteArray()
                              << "Internal Error  cond[file.exists()]";
@@ -204,7 +203,6 @@ void TestFile::writeAllToDevice_data()
     QTest::addColumn<bool>("ok");
 
     QTest::newRow("partial writes continue") << qint64(3) << qint64(8) << 3 << true;
-    QTest::newRow("nothing to write") << qint64(10) << qint64(0) << 0 << true;
     QTest::newRow("negative size") << qint64(10) << qint64(-5) << 0 << true;
     QTest::newRow("device takes nothing") << qint64(0) << qint64(3) << 1 << false;
 }
@@ -508,7 +506,6 @@ void TestFile::junctionInfo_data()
     QTest::newRow("link with a relative target") << "relative" << true << "target dir";
     QTest::newRow("plain folder") << "target dir" << true << "";
     QTest::newRow("file") << "target dir/file.txt" << false << "";
-    QTest::newRow("link to a file") << "filelink" << false << "";
     QTest::newRow("missing") << "missing" << false << "";
     QTest::newRow("empty") << "" << false << "";
 }
@@ -521,7 +518,6 @@ void TestFile::junctionInfo()
     QTemporaryDir root;
     makeFile(root.filePath("target dir/file.txt"));
     QVERIFY(QFile::link("target dir", root.filePath("relative")));
-    QVERIFY(QFile::link(root.filePath("target dir/file.txt"), root.filePath("filelink")));
 
     RkLogCapture capture;
     bool isJunction = true;
@@ -551,7 +547,6 @@ void TestFile::pathsPointToTheSameFile_data()
     row("two files in one folder", "d/one.txt", "d/two.txt", false);
     row("same name in two folders", "d/one.txt", "e/one.txt", false);
     row("missing", "d/one.txt", "d/none.txt", false);
-    row("both missing", "d/none.txt", "d/none.txt", false);
     row("empty", "", "", false);
 }
 
