@@ -1,6 +1,8 @@
 #pragma once
 
-// Small helpers shared by the test suites.
+// Small helpers shared by the test suites: helper programs, and the log lines a test captured
+// with the source line numbers of failure records dropped, so that expected texts survive edits
+// of the code.
 #include "rklib/RkLogFile.h"
 
 #include <QRegularExpression>
@@ -14,13 +16,24 @@ inline QString helper(const char* inName)
     return QStringLiteral(ZUBASE_TEST_HELPER_DIR "/") + QLatin1String(inName);
 }
 
-// The failure lines of the log ("Tz"), without their source line numbers.
-inline QStringList failureLines(const RkLogCapture& inCapture)
+// Texts of the entries of inCategory (nullptr: any) at inMinimum or above, in order.
+inline QStringList logLines(const RkLogCapture& inCapture, const char* inCategory = nullptr,
+                            RkLogLevel inMinimum = RkLogDebug)
 {
+    static const QRegularExpression lineNumber(R"(\(\d+\): )");
     QStringList lines;
-    for (const std::string& text : inCapture.texts("Tz"))
-        lines << QString::fromStdString(text).replace(QRegularExpression(R"(\(\d+\): )"), ": ");
+    for (const RkLogEntry& entry : inCapture.entries()) {
+        if (entry.level >= inMinimum && (!inCategory || entry.category == inCategory))
+            lines << QString::fromStdString(entry.text).replace(lineNumber, ": ");
+    }
     return lines;
 }
 
+// The failure records reported through Tz::fail, as "<where>: <message>  <detail>".
+inline QStringList failureLines(const RkLogCapture& inCapture)
+{
+    return logLines(inCapture, "Tz");
+}
+
 } // namespace TestSupport
+

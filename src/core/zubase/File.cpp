@@ -40,6 +40,15 @@ void traceRemoval(const char* inFormat, const QString& inPath, bool inGone)
 
 void* const sCurrentProcessToken = reinterpret_cast<void*>(static_cast<intptr_t>(-1));
 
+// Opens a directory's reparse point, with the restore privilege raised first as writing or
+// reading one may need it.
+int openMountPoint(const std::string& inPath, ZuPlatform::ReparseHandle& outHandle)
+{
+    ZuBase::win32TokenAdjustPrivilege(sCurrentProcessToken, const_cast<char*>("SeRestorePrivilege"),
+                                      true);
+    return ZuPlatform::filesOpenReparsePoint(inPath, outHandle);
+}
+
 } // namespace
 
 namespace ZuBase::File {
@@ -165,6 +174,7 @@ RkResult junctionCreate(const QString& inJunctionPath, const QString& inTargetPa
         return res;
     }
     const std::string path = Q2M(junctionPath).toStdString();
+    ZuPlatform::ReparseHandle hDirMountPoint;
 
     const int createError = ZuPlatform::filesCreateDirectory(path);
     const bool bret = createError == 0;
@@ -176,11 +186,7 @@ RkResult junctionCreate(const QString& inJunctionPath, const QString& inTargetPa
     }
     const bool createdHere = bret;
 
-    ZuBase::win32TokenAdjustPrivilege(sCurrentProcessToken, const_cast<char*>("SeRestorePrivilege"),
-                                      true);
-
-    ZuPlatform::ReparseHandle hDirMountPoint;
-    const int openError = ZuPlatform::filesOpenReparsePoint(path, hDirMountPoint);
+    const int openError = openMountPoint(path, hDirMountPoint);
     if (Tz::failWin(
             RK_CHECK(openError == 0, "hDirMountPoint!=((HANDLE)(LONG_PTR)-1)", "::CreateFileW"),
             openError)) {
@@ -209,11 +215,8 @@ RkResult junctionInfo(const QString& inPath, bool& outIsJunction, QString& outTa
         return res;
     }
     const std::string path = Q2M(nativeAbsolutePath(inPath)).toStdString();
-    ZuBase::win32TokenAdjustPrivilege(sCurrentProcessToken, const_cast<char*>("SeRestorePrivilege"),
-                                      true);
-
     ZuPlatform::ReparseHandle hDirMountPoint;
-    const int openError = ZuPlatform::filesOpenReparsePoint(path, hDirMountPoint);
+    const int openError = openMountPoint(path, hDirMountPoint);
     if (Tz::failWin(
             RK_CHECK(openError == 0, "hDirMountPoint!=((HANDLE)(LONG_PTR)-1)", "::CreateFileW"),
             openError)) {

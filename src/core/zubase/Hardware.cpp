@@ -9,6 +9,8 @@
 #include <QList>
 #include <QProcess>
 
+#include <vector>
+
 namespace {
 
 // The text after the first ':' and the blank that follows it.
@@ -38,51 +40,42 @@ namespace ZuBase {
 void parseDmiDecodeOutput(const QByteArray& inOutput, QString& ioProductName,
                           QString& ioSerialNumber, QString& ioBios)
 {
-    enum class Section
-    {
-        Between,
-        Bios,
-        System,
-        Other
-    };
     QByteArray product = ioProductName.toLatin1();
     QByteArray serial = ioSerialNumber.toLatin1();
     QByteArray bios = ioBios.toLatin1();
-    Section section = Section::Between;
+    // The section table: the lines read in each section; the first key a line starts with wins.
+    struct Field
+    {
+        const char* key;
+        QByteArray* value;
+        bool append; // after ", ", else replacing the value
+    };
+    const std::vector<Field> biosFields{
+        {"Vendor:", &bios, false}, {"Version:", &bios, true}, {"Release Date:", &bios, true}};
+    const std::vector<Field> systemFields{{"Product Name:", &product, false},
+                                          {"Serial Number:", &serial, false}};
+    const std::vector<Field> otherFields;
+    // Between sections (null) the next line opens one; an empty line ends it.
+    const std::vector<Field>* section = nullptr;
     const QList<QByteArray> lines = inOutput.split('\n');
     for (const QByteArray& rawLine : lines) {
         const QByteArray line = rawLine.trimmed();
-        switch (section) {
-        case Section::Between:
-            if (line.startsWith("BIOS Information"))
-                section = Section::Bios;
-            else if (line.startsWith("System Information"))
-                section = Section::System;
-            else
-                section = Section::Other;
-            break;
-        case Section::Bios:
-            if (line.isEmpty())
-                section = Section::Between;
-            else if (line.startsWith("Vendor:"))
-                bios = lineValue(line);
-            else if (line.startsWith("Version:"))
-                bios += ", " + lineValue(line);
-            else if (line.startsWith("Release Date:"))
-                bios += ", " + lineValue(line);
-            break;
-        case Section::System:
-            if (line.isEmpty())
-                section = Section::Between;
-            else if (line.startsWith("Product Name:"))
-                product = lineValue(line);
-            else if (line.startsWith("Serial Number:"))
-                serial = lineValue(line);
-            break;
-        case Section::Other:
-            if (line.isEmpty())
-                section = Section::Between;
-            break;
+        if (!section) {
+            section = line.startsWith("BIOS Information")     ? &biosFields
+                      : line.startsWith("System Information") ? &systemFields
+                                                              : &otherFields;
+            continue;
+        }
+        if (line.isEmpty()) {
+            section = nullptr;
+            continue;
+        }
+        for (const Field& field : *section) {
+            if (line.startsWith(field.key)) {
+                *field.value =
+                    field.append ? *field.value + ", " + lineValue(line) : lineValue(line);
+                break;
+            }
         }
     }
     ioProductName = QString::fromLatin1(product);

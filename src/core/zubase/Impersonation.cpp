@@ -123,6 +123,25 @@ static RkResult win32TokenGetInformation(void* const inToken, ZuPlatform::TokenI
     return res;
 }
 
+// One block of the token dump: the entries of one information class, a line each.
+template <typename Entry>
+static void logTokenSection(RkLogFile& ioLog, void* const inToken,
+                            ZuPlatform::TokenInformation inClass, const char* inName,
+                            QString (*inLine)(const Entry&))
+{
+    ioLog.printf("    <%s>", inName);
+    std::vector<unsigned char> data;
+    if (win32TokenGetInformation(inToken, inClass, data).isOk()) {
+        const std::size_t count = data.size() / sizeof(Entry);
+        for (std::size_t i = 0; i < count; ++i) {
+            Entry entry;
+            std::memcpy(&entry, data.data() + i * sizeof entry, sizeof entry);
+            ioLog.printf("        %s", Q2M(inLine(entry)).constData());
+        }
+    }
+    ioLog.printf("    </%s>", inName);
+}
+
 namespace ZuBase {
 
 void* Win32Impersonation::sAccessToken = nullptr;
@@ -368,27 +387,9 @@ void win32TokenLog(QString inTitle, void* const inToken)
         opened = true;
     }
 
-    std::vector<unsigned char> data;
-    log.printf("    <TokenGroups>");
-    if (win32TokenGetInformation(token, ZuPlatform::TokenInformation::Groups, data).isOk()) {
-        const std::size_t count = data.size() / sizeof(ZuPlatform::TokenGroupEntry);
-        for (std::size_t i = 0; i < count; ++i) {
-            ZuPlatform::TokenGroupEntry entry;
-            std::memcpy(&entry, data.data() + i * sizeof entry, sizeof entry);
-            log.printf("        %s", Q2M(groupLine(entry)).constData());
-        }
-    }
-    log.printf("    </TokenGroups>");
-    log.printf("    <TokenPrivileges>");
-    if (win32TokenGetInformation(token, ZuPlatform::TokenInformation::Privileges, data).isOk()) {
-        const std::size_t count = data.size() / sizeof(ZuPlatform::TokenPrivilegeEntry);
-        for (std::size_t i = 0; i < count; ++i) {
-            ZuPlatform::TokenPrivilegeEntry entry;
-            std::memcpy(&entry, data.data() + i * sizeof entry, sizeof entry);
-            log.printf("        %s", Q2M(privilegeLine(entry)).constData());
-        }
-    }
-    log.printf("    </TokenPrivileges>");
+    logTokenSection(log, token, ZuPlatform::TokenInformation::Groups, "TokenGroups", groupLine);
+    logTokenSection(log, token, ZuPlatform::TokenInformation::Privileges, "TokenPrivileges",
+                    privilegeLine);
     log.printf("</token> [%s]", title.constData());
     if (opened)
         ZuPlatform::accountsCloseToken(accountToken(token));

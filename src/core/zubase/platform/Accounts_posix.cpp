@@ -309,6 +309,23 @@ unsigned long accountsCurrentThreadId()
     return static_cast<unsigned long>(::syscall(SYS_gettid));
 }
 
+namespace {
+
+// Hands token entries to a caller's buffer; ERANGE with the size needed when it is too small.
+template <typename Entry>
+int copyEntries(const std::vector<Entry>& inEntries, void* ioBuffer, std::size_t inSize,
+                std::size_t& outNeeded)
+{
+    outNeeded = inEntries.size() * sizeof(Entry);
+    if (inSize < outNeeded)
+        return ERANGE;
+    if (outNeeded)
+        std::memcpy(ioBuffer, inEntries.data(), outNeeded);
+    return 0;
+}
+
+} // namespace
+
 int accountsGetTokenInformation(const AccountToken* inToken, TokenInformation inClass,
                                 void* ioBuffer, std::size_t inSize, std::size_t& outNeeded)
 {
@@ -323,12 +340,7 @@ int accountsGetTokenInformation(const AccountToken* inToken, TokenInformation in
                                              kGroupEnabled | (i == 0 ? kGroupOwner : 0);
             entries.push_back({SidKind::UnixGroup, inToken->groups[i], attributes});
         }
-        outNeeded = entries.size() * sizeof(TokenGroupEntry);
-        if (inSize < outNeeded)
-            return ERANGE;
-        if (outNeeded)
-            std::memcpy(ioBuffer, entries.data(), outNeeded);
-        return 0;
+        return copyEntries(entries, ioBuffer, inSize, outNeeded);
     }
 
     std::vector<TokenPrivilegeEntry> entries;
@@ -348,12 +360,7 @@ int accountsGetTokenInformation(const AccountToken* inToken, TokenInformation in
         }
         ::cap_free(caps);
     }
-    outNeeded = entries.size() * sizeof(TokenPrivilegeEntry);
-    if (inSize < outNeeded)
-        return ERANGE;
-    if (outNeeded)
-        std::memcpy(ioBuffer, entries.data(), outNeeded);
-    return 0;
+    return copyEntries(entries, ioBuffer, inSize, outNeeded);
 }
 
 int accountsLookupPrivilegeValue(const std::string& inName, std::uint32_t& outPrivilege)
@@ -431,36 +438,39 @@ int accountsAdjustPrivilege(AccountToken* inToken, std::uint32_t inPrivilege,
     return error;
 }
 
+namespace {
+
+// The name of a user or group id through getpwuid_r() or getgrgid_r().
+template <typename Id, typename Entry>
+int lookupName(int (*inLookup)(Id, Entry*, char*, std::size_t, Entry**), char* Entry::*inName,
+               Id inId, const char* inDomain, std::string& outDomain, std::string& outName)
+{
+    std::vector<char> buffer(16384);
+    Entry entry;
+    Entry* found = nullptr;
+    const int rc = inLookup(inId, &entry, buffer.data(), buffer.size(), &found);
+    if (rc != 0)
+        return rc;
+    if (!found)
+        return kAccountsNoneMapped;
+    outDomain = inDomain;
+    outName = found->*inName;
+    return 0;
+}
+
+} // namespace
+
 int accountsLookupSid(SidKind inKind, std::uint32_t inId, std::string& outDomain,
                       std::string& outName)
 {
     outDomain.clear();
     outName.clear();
-    std::vector<char> buffer(16384);
-    if (inKind == SidKind::UnixUser) {
-        passwd entry;
-        passwd* found = nullptr;
-        const int rc = ::getpwuid_r(inId, &entry, buffer.data(), buffer.size(), &found);
-        if (rc != 0)
-            return rc;
-        if (!found)
-            return kAccountsNoneMapped;
-        outDomain = "Unix User";
-        outName = found->pw_name;
-        return 0;
-    }
-    if (inKind == SidKind::UnixGroup) {
-        group entry;
-        group* found = nullptr;
-        const int rc = ::getgrgid_r(inId, &entry, buffer.data(), buffer.size(), &found);
-        if (rc != 0)
-            return rc;
-        if (!found)
-            return kAccountsNoneMapped;
-        outDomain = "Unix Group";
-        outName = found->gr_name;
-        return 0;
-    }
+    if (inKind == SidKind::UnixUser)
+        return lookupName(&::getpwuid_r, &passwd::pw_name, uid_t(inId), "Unix User", outDomain,
+                          outName);
+    if (inKind == SidKind::UnixGroup)
+        return lookupName(&::getgrgid_r, &group::gr_name, gid_t(inId), "Unix Group", outDomain,
+                          outName);
     return EINVAL;
 }
 
