@@ -10,6 +10,8 @@
 #include <QTemporaryDir>
 #include <QtTest>
 
+using TestSupport::logLines;
+
 namespace {
 
 const QString sWhere = QStringLiteral("src/core/zubase/File:ZuBase::File::");
@@ -570,5 +572,3 @@ void TestFile::pathsPointToTheSameFile()
 
 QTEST_GUILESS_MAIN(TestFile)
 #include "tst_file.moc"
-
-using TestSupport::logLines;

@@ -19,6 +19,8 @@
 #include <sys/statvfs.h>
 #include <unistd.h>
 
+using TestSupport::logLines;
+
 namespace {
 
 const QString sSample =
@@ -277,5 +279,3 @@ void TestHardware::peerNameFailure()
 
 QTEST_GUILESS_MAIN(TestHardware)
 #include "tst_hardware.moc"
-
-using TestSupport::logLines;

@@ -20,6 +20,8 @@
 #include <thread>
 #include <unistd.h>
 
+using TestSupport::logLines;
+
 namespace {
 
 void* const sProcessToken = reinterpret_cast<void*>(static_cast<intptr_t>(-1));
@@ -437,5 +439,3 @@ void TestImpersonation::impersonateFailure()
 
 QTEST_GUILESS_MAIN(TestImpersonation)
 #include "tst_impersonation.moc"
-
-using TestSupport::logLines;
