@@ -23,12 +23,7 @@ namespace {
 
 using PixelTest = std::function<bool(QRgb)>;
 
-float sScale = 1.0f;
-float testScaling(const QWidget*)
-{
-    return sScale;
-}
-
+float sScale = 1.0f; // of the large-icon menus
 ZuStyle* appStyle()
 {
     return dynamic_cast<ZuStyle*>(QApplication::style());
@@ -65,29 +60,26 @@ QImage drawn(const QSize& inSize, const std::function<void(QPainter&)>& inDraw)
     return image;
 }
 
-int countPixels(const QImage& inImage, const QRect& inRect, const PixelTest& inTest)
+// The pixels of the rectangle that pass the test: how many, and their bounding box.
+struct Ink
 {
     int count = 0;
+    QRect box;
+};
+Ink ink(const QImage& inImage, const QRect& inRect, const PixelTest& inTest)
+{
+    Ink ink;
     const QRect rect = inRect.intersected(inImage.rect());
     for (int y = rect.top(); y <= rect.bottom(); ++y) {
-        for (int x = rect.left(); x <= rect.right(); ++x)
-            count += inTest(inImage.pixel(x, y)) ? 1 : 0;
-    }
-    return count;
-}
-
-QRect boundingBox(const QImage& inImage, const PixelTest& inTest)
-{
-    QRect box;
-    for (int y = 0; y < inImage.height(); ++y) {
-        for (int x = 0; x < inImage.width(); ++x) {
-            if (inTest(inImage.pixel(x, y)))
-                box |= QRect(x, y, 1, 1);
+        for (int x = rect.left(); x <= rect.right(); ++x) {
+            if (inTest(inImage.pixel(x, y))) {
+                ++ink.count;
+                ink.box |= QRect(x, y, 1, 1);
+            }
         }
     }
-    return box;
+    return ink;
 }
-
 PixelTest is(const QColor& inColor)
 {
     return [rgb = inColor.rgb()](QRgb pixel) {
@@ -95,12 +87,7 @@ PixelTest is(const QColor& inColor)
     };
 }
 
-enum MarkedWidget
-{
-    Box,
-    Menu,
-    Radio
-};
+const int Box = 0, Menu = 1, Radio = 2; // the widgets of the check-mark table
 
 class OptionTabBar : public QTabBar
 {
@@ -131,7 +118,6 @@ private slots:
     void branchBox();
     void toolButtonLabelWithNegativeIconSize_data();
     void toolButtonLabelWithNegativeIconSize();
-    void progressBarFill_data();
     void progressBarFill();
     void disabledIconOnDarkScheme_data();
     void disabledIconOnDarkScheme();
@@ -188,11 +174,11 @@ void tst_Style::boldTabLabelFromTabData()
     bar.setCurrentIndex(2); // the two compared tabs share the unselected look
     bar.resize(bar.sizeHint());
     const QImage image = grabImage(bar);
-    auto ink = [](QRgb pixel) {
+    const PixelTest text = [](QRgb pixel) {
         return qGray(pixel) < 100;
     };
-    const int first = countPixels(image, bar.tabRect(0), ink);
-    const int second = countPixels(image, bar.tabRect(1), ink);
+    const int first = ink(image, bar.tabRect(0), text).count;
+    const int second = ink(image, bar.tabRect(1), text).count;
     QVERIFY(second > 20);
     // A bold label gets a tab wide enough for bold text.
     QCOMPARE(bar.tabRect(0).width() > bar.tabRect(1).width(), bold);
@@ -261,7 +247,7 @@ void tst_Style::largeMenuIcons()
     QFETCH(float, scale);
     QFETCH(int, large);
     sScale = scale;
-    ZuStyle::setIconScalingFunction(&testScaling);
+    ZuStyle::setIconScalingFunction([](const QWidget*) { return sScale; });
     QPixmap red(64, 64);
     red.fill(Qt::red);
     ZuStyle::QLargeIconMenu largeMenu;
@@ -270,14 +256,14 @@ void tst_Style::largeMenuIcons()
     QAction* plainAction = plainMenu.addAction(QIcon(red), QStringLiteral("Plain"));
 
     plainMenu.resize(plainMenu.sizeHint());
-    QCOMPARE(boundingBox(grabImage(plainMenu), is(Qt::red)).size(), QSize(16, 16));
+    QCOMPARE(ink(grabImage(plainMenu), plainMenu.rect(), is(Qt::red)).box.size(), QSize(16, 16));
     largeMenu.resize(largeMenu.sizeHint());
-    QCOMPARE(boundingBox(grabImage(largeMenu), is(Qt::red)).size(), QSize(large, large));
+    QCOMPARE(ink(grabImage(largeMenu), largeMenu.rect(), is(Qt::red)).box.size(),
+             QSize(large, large));
     QVERIFY(largeMenu.actionGeometry(largeAction).height() >= large);
     QVERIFY(plainMenu.actionGeometry(plainAction).height() < 32);
     // Asked without a widget, the size is that of the menu drawn last.
     QCOMPARE(appStyle()->pixelMetric(QStyle::PM_SmallIconSize), large);
-    QCOMPARE(appStyle()->pixelMetric(QStyle::PM_ToolBarIconSize), 32);
 
     ZuStyle::setIconScalingFunction(nullptr);
     QCOMPARE(appStyle()->pixelMetric(QStyle::PM_SmallIconSize, nullptr, &largeMenu), 32);
@@ -289,19 +275,19 @@ void tst_Style::checkMarks_data()
     QTest::addColumn<QColor>("base");
     QTest::addColumn<bool>("checked");
     QTest::addColumn<int>("expected"); // -1 a darker mark, 1 a lighter mark, 0 none
-    QTest::newRow("box, white") << int(Box) << QColor(Qt::white) << true << -1;
-    QTest::newRow("box, value 129") << int(Box) << QColor(129, 129, 129) << true << -1;
-    QTest::newRow("box, value 128") << int(Box) << QColor(128, 128, 128) << true << 1;
-    QTest::newRow("box, dark") << int(Box) << QColor(40, 40, 40) << true << 1;
+    QTest::newRow("box, white") << Box << QColor(Qt::white) << true << -1;
+    QTest::newRow("box, value 129") << Box << QColor(129, 129, 129) << true << -1;
+    QTest::newRow("box, value 128") << Box << QColor(128, 128, 128) << true << 1;
+    QTest::newRow("box, dark") << Box << QColor(40, 40, 40) << true << 1;
     // Either mark's Off state is blank: an unchecked box shows no mark.
-    QTest::newRow("box, white, unchecked") << int(Box) << QColor(Qt::white) << false << 0;
-    QTest::newRow("box, dark, unchecked") << int(Box) << QColor(40, 40, 40) << false << 0;
+    QTest::newRow("box, white, unchecked") << Box << QColor(Qt::white) << false << 0;
+    QTest::newRow("box, dark, unchecked") << Box << QColor(40, 40, 40) << false << 0;
     // Menus draw the light mark, inverted (XOR) on a light scheme so that it shows dark.
-    QTest::newRow("menu, light") << int(Menu) << QColor(Qt::white) << true << -1;
-    QTest::newRow("menu, dark") << int(Menu) << QColor(40, 40, 40) << true << 1;
-    QTest::newRow("menu, unchecked") << int(Menu) << QColor(Qt::white) << false << 0;
-    QTest::newRow("radio") << int(Radio) << QColor(Qt::white) << true << -1;
-    QTest::newRow("radio, unchecked") << int(Radio) << QColor(Qt::white) << false << 0;
+    QTest::newRow("menu, light") << Menu << QColor(Qt::white) << true << -1;
+    QTest::newRow("menu, dark") << Menu << QColor(40, 40, 40) << true << 1;
+    QTest::newRow("menu, unchecked") << Menu << QColor(Qt::white) << false << 0;
+    QTest::newRow("radio") << Radio << QColor(Qt::white) << true << -1;
+    QTest::newRow("radio, unchecked") << Radio << QColor(Qt::white) << false << 0;
 }
 
 void tst_Style::checkMarks()
@@ -342,9 +328,9 @@ void tst_Style::checkMarks()
                      .adjusted(3, 3, -3, -3);
     }
     const int grey = qGray(base.rgb());
-    QCOMPARE(countPixels(image, inside, [&](QRgb p) { return qGray(p) < grey - 60; }) > 3,
+    QCOMPARE(ink(image, inside, [&](QRgb p) { return qGray(p) < grey - 60; }).count > 3,
              expected < 0);
-    QCOMPARE(countPixels(image, inside, [&](QRgb p) { return qGray(p) > grey + 60; }) > 3,
+    QCOMPARE(ink(image, inside, [&](QRgb p) { return qGray(p) > grey + 60; }).count > 3,
              expected > 0);
 }
 
@@ -381,7 +367,7 @@ void tst_Style::checkBoxBackground()
         appStyle()->drawControl(QStyle::CE_CheckBox, &option, &painter, &box);
     });
     // The two columns the drawing leaves free on the right show the fill.
-    QCOMPARE(countPixels(image, QRect(78, 0, 2, 20), is(fill)), 40);
+    QCOMPARE(ink(image, QRect(78, 0, 2, 20), is(fill)).count, 40);
 }
 
 void tst_Style::branchBox_data()
@@ -414,13 +400,13 @@ void tst_Style::branchBox()
         });
     };
     const QImage image = draw(appStyle());
-    const QRect box = boundingBox(image, is(Qt::blue));
+    const QRect box = ink(image, image.rect(), is(Qt::blue)).box;
     QCOMPARE(box.size(), QSize(side, side));
     QCOMPARE(box.center(), option.rect.center());
     // Minus while open, plus while closed.
     const QPoint middle = box.topLeft() + QPoint(side / 2, side / 2);
-    QCOMPARE(countPixels(image, QRect(box.left(), middle.y(), side, 1), is(Qt::red)), side - 4);
-    QCOMPARE(countPixels(image, QRect(middle.x(), box.top(), 1, side), is(Qt::red)),
+    QCOMPARE(ink(image, QRect(box.left(), middle.y(), side, 1), is(Qt::red)).count, side - 4);
+    QCOMPARE(ink(image, QRect(middle.x(), box.top(), 1, side), is(Qt::red)).count,
              open ? 1 : side - 4);
 
     // Items without children are drawn as Cleanlooks draws them.
@@ -454,36 +440,29 @@ void tst_Style::toolButtonLabelWithNegativeIconSize()
     const QImage image = ::drawn(QSize(80, 24), [&](QPainter& painter) {
         appStyle()->drawControl(QStyle::CE_ToolButtonLabel, &option, &painter);
     });
-    QCOMPARE(countPixels(image, image.rect(), is(Qt::white)) < 80 * 24, drawn);
-}
-
-void tst_Style::progressBarFill_data()
-{
-    QTest::addColumn<bool>("inverted");
-    QTest::newRow("left to right") << false;
-    QTest::newRow("inverted") << true;
+    QCOMPARE(ink(image, image.rect(), is(Qt::white)).count < 80 * 24, drawn);
 }
 
 void tst_Style::progressBarFill()
 {
-    QFETCH(bool, inverted);
-    QProgressBar bar;
     QPalette palette = testPalette();
     palette.setColor(QPalette::Highlight, QColor(0, 160, 0));
-    bar.setPalette(palette);
-    bar.setTextVisible(false);
-    bar.setRange(0, 200);
-    bar.setValue(50);
-    bar.setInvertedAppearance(inverted);
-    bar.resize(200, 20);
-    const QImage image = grabImage(bar);
     auto green = [](QRgb p) {
         return qGreen(p) > qRed(p) + 60;
     };
-    const int leftHalf = countPixels(image, QRect(0, 0, 100, 20), green);
-    const int rightHalf = countPixels(image, QRect(100, 0, 100, 20), green);
-    QVERIFY((inverted ? rightHalf : leftHalf) > 200);
-    QCOMPARE(inverted ? leftHalf : rightHalf, 0);
+    for (bool inverted : {false, true}) {
+        QProgressBar bar;
+        bar.setPalette(palette);
+        bar.setTextVisible(false);
+        bar.setRange(0, 200);
+        bar.setValue(50);
+        bar.setInvertedAppearance(inverted);
+        bar.resize(200, 20);
+        const QImage image = grabImage(bar);
+        const int filled = ink(image, QRect(inverted ? 100 : 0, 0, 100, 20), green).count;
+        QVERIFY2(filled > 200, inverted ? "inverted" : "left to right");
+        QCOMPARE(ink(image, QRect(inverted ? 0 : 100, 0, 100, 20), green).count, 0);
+    }
 }
 
 void tst_Style::disabledIconOnDarkScheme_data()
