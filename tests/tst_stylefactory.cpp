@@ -40,18 +40,16 @@ QString writeFile(const QTemporaryDir& inDir, const QString& inName, const QStri
 // "Panel" colour.
 QString schemeText(const QString& inName, const QColor& inMidlight, const QColor& inPanel)
 {
-    return QStringLiteral("<ColorScheme Version=\"1.0\" Name=\"%1\">"
-                          "<Active><Color Id=\"Midlight\" Red=\"%2\" Green=\"%3\" Blue=\"%4\"/>"
-                          "<Color Id=\"Button\" Red=\"%5\" Green=\"%6\" Blue=\"%7\"/></Active>"
-                          "<UserDefined><Color Id=\"Panel\" Red=\"%5\" Green=\"%6\" Blue=\"%7\"/>"
-                          "</UserDefined></ColorScheme>")
-        .arg(inName)
-        .arg(inMidlight.red())
-        .arg(inMidlight.green())
-        .arg(inMidlight.blue())
-        .arg(inPanel.red())
-        .arg(inPanel.green())
-        .arg(inPanel.blue());
+    auto rgb = [](const QColor& color) {
+        return QStringLiteral("Red=\"%1\" Green=\"%2\" Blue=\"%3\"")
+            .arg(color.red())
+            .arg(color.green())
+            .arg(color.blue());
+    };
+    return QStringLiteral("<ColorScheme Version=\"1.0\" Name=\"%1\"><Active>"
+                          "<Color Id=\"Midlight\" %2/><Color Id=\"Button\" %3/></Active>"
+                          "<UserDefined><Color Id=\"Panel\" %3/></UserDefined></ColorScheme>")
+        .arg(inName, rgb(inMidlight), rgb(inPanel));
 }
 
 const ZuColorScheme* scheme(const QString& inName)
@@ -88,8 +86,7 @@ private slots:
     void tesselNative();
     void nativeClass();
     void styleForWidgetTree();
-    void themeChangeRestoresSchemePalette();
-    void themeChangeHookRemovedWithFactory();
+    void themeChangeObserver();
     void styledWidgetColours_data();
     void styledWidgetColours();
     void widgetsFollowSchemeSwitch();
@@ -398,7 +395,7 @@ void tst_StyleFactory::styleForWidgetTree()
     }
 }
 
-void tst_StyleFactory::themeChangeRestoresSchemePalette()
+void tst_StyleFactory::themeChangeObserver()
 {
     // The factory's observer sees the events the application dispatches, whatever the receiver.
     ZuStyleFactory& factory = ZuStyleFactory::instance();
@@ -413,25 +410,21 @@ void tst_StyleFactory::themeChangeRestoresSchemePalette()
     QEvent themeChange(QEvent::ThemeChange);
     QCoreApplication::sendEvent(&window, &themeChange);
     QCOMPARE(QGuiApplication::palette(), factory.standardPalette());
-}
 
-void tst_StyleFactory::themeChangeHookRemovedWithFactory()
-{
-    // The application holds three hooks and drops any further one. With the process-wide
-    // factory's observer and a second factory's in place, one probe fits and one does not.
+    // The observer leaves with its factory. The application holds three hooks and drops any
+    // further one: with the process-wide factory's observer and a second factory's in place,
+    // one probe fits and one does not.
     ZuStyleFactory* second = ZuStyleFactoryPrivate::createDetached();
     ProbeHook fits, late;
     ZuApplication::installHookNotify(&fits);
     ZuApplication::installHookNotify(&late);
-    QObject receiver;
-    QEvent event(QEvent::User);
-    QCoreApplication::sendEvent(&receiver, &event);
+    QCoreApplication::sendEvent(&window, &unrelated);
     const int lateSeenWhileFull = late.seen;
 
     // The second factory takes its observer along, which frees the slot for the late probe.
     ZuStyleFactoryPrivate::destroyDetached(second);
     ZuApplication::installHookNotify(&late);
-    QCoreApplication::sendEvent(&receiver, &event);
+    QCoreApplication::sendEvent(&window, &unrelated);
     ZuApplication::deInstallHookNotify(&fits); // before any check can return
     ZuApplication::deInstallHookNotify(&late);
     QCOMPARE(fits.seen, 2);
@@ -441,7 +434,7 @@ void tst_StyleFactory::themeChangeHookRemovedWithFactory()
 
 void tst_StyleFactory::styledWidgetColours_data()
 {
-    QTest::addColumn<QByteArray>("suffix"); // of the names "Panel<suffix>", "PanelText<suffix>"
+    QTest::addColumn<QByteArray>("suffix"); // of "PanelText<suffix>", "PanelBackground<suffix>"
     QTest::addColumn<bool>("defaults");     // red text and blue background
     QTest::addColumn<QColor>("foreground");
     QTest::addColumn<QColor>("background");
