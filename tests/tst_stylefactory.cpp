@@ -179,9 +179,12 @@ void tst_StyleFactory::schemePalettes()
         QCOMPARE(p.color(QPalette::Active, role), start.color(QPalette::Active, role));
     QCOMPARE(p.color(QPalette::Disabled, QPalette::Window),
              start.color(QPalette::Disabled, QPalette::Window));
-    // No Inactive element: Inactive copies Active, in roles the file sets and in those it does not.
-    for (auto role : {QPalette::Window, QPalette::Text, QPalette::Link, QPalette::Button})
-        QCOMPARE(p.color(QPalette::Inactive, role), p.color(QPalette::Active, role));
+    // No Inactive element: Inactive copies Active in every role a file can set; the other roles
+    // keep the starting colours, whose Inactive and Active agree.
+    for (int role = 0; role < QPalette::NColorRoles; ++role) {
+        const auto r = QPalette::ColorRole(role);
+        QCOMPARE(p.color(QPalette::Inactive, r), p.color(QPalette::Active, r));
+    }
     // First entry per id wins; only the first UserDefined element counts.
     QCOMPARE(full->userDefinedColors.keys(), QStringList({"PanelBackground", "PanelText"}));
     QCOMPARE(full->userDefinedColors.value(QStringLiteral("PanelBackground")), QColor(11, 22, 33));
