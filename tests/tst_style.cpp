@@ -1,6 +1,5 @@
 // ZuStyle as a user sees it: widgets and style elements drawn into images.
 #include "zubase/ZuStyle.h"
-#include "zubase/ZuStyleFactory.h"
 
 #include <QApplication>
 #include <QCheckBox>
@@ -15,7 +14,6 @@
 #include <QStyleFactory>
 #include <QStyleOption>
 #include <QTabBar>
-#include <QTemporaryDir>
 #include <QtTest>
 
 #include <functional>
@@ -23,15 +21,17 @@
 
 namespace {
 
-float sScale = 1.0f;
-float testScaling(const QWidget*)
-{
-    return sScale;
-}
+using PixelTest = std::function<bool(QRgb)>;
 
+float sScale = 1.0f; // of the large-icon menus
 ZuStyle* appStyle()
 {
     return dynamic_cast<ZuStyle*>(QApplication::style());
+}
+
+std::unique_ptr<QStyle> cleanlooks()
+{
+    return std::unique_ptr<QStyle>(QStyleFactory::create(QStringLiteral("Cleanlooks")));
 }
 
 // Light colours with a black text and a mid-grey frame, so that ink is easy to tell apart.
@@ -39,9 +39,8 @@ QPalette testPalette(const QColor& inBase = Qt::white)
 {
     QPalette palette(QColor(230, 230, 230), QColor(240, 240, 240));
     palette.setColor(QPalette::Base, inBase);
-    palette.setColor(QPalette::WindowText, Qt::black);
-    palette.setColor(QPalette::Text, Qt::black);
-    palette.setColor(QPalette::ButtonText, Qt::black);
+    for (QPalette::ColorRole role : {QPalette::WindowText, QPalette::Text, QPalette::ButtonText})
+        palette.setColor(role, Qt::black);
     palette.setColor(QPalette::Dark, QColor(130, 130, 130));
     return palette;
 }
@@ -54,50 +53,41 @@ QImage grabImage(QWidget& inWidget)
 // Draws one style call into a white image of the given size.
 QImage drawn(const QSize& inSize, const std::function<void(QPainter&)>& inDraw)
 {
-    QImage image(inSize, QImage::Format_ARGB32_Premultiplied);
+    QImage image(inSize, QImage::Format_RGB32);
     image.fill(Qt::white);
     QPainter painter(&image);
     inDraw(painter);
-    painter.end();
     return image;
 }
 
-int countPixels(const QImage& inImage, const QRect& inRect, const std::function<bool(QRgb)>& inTest)
+// The pixels of the rectangle that pass the test: how many, and their bounding box.
+struct Ink
 {
     int count = 0;
+    QRect box;
+};
+Ink ink(const QImage& inImage, const QRect& inRect, const PixelTest& inTest)
+{
+    Ink ink;
     const QRect rect = inRect.intersected(inImage.rect());
     for (int y = rect.top(); y <= rect.bottom(); ++y) {
         for (int x = rect.left(); x <= rect.right(); ++x) {
-            if (inTest(inImage.pixel(x, y)))
-                ++count;
+            if (inTest(inImage.pixel(x, y))) {
+                ++ink.count;
+                ink.box |= QRect(x, y, 1, 1);
+            }
         }
     }
-    return count;
+    return ink;
+}
+PixelTest is(const QColor& inColor)
+{
+    return [rgb = inColor.rgb()](QRgb pixel) {
+        return pixel == rgb;
+    };
 }
 
-QRect boundingBox(const QImage& inImage, const std::function<bool(QRgb)>& inTest)
-{
-    QRect box;
-    for (int y = 0; y < inImage.height(); ++y) {
-        for (int x = 0; x < inImage.width(); ++x) {
-            if (inTest(inImage.pixel(x, y)))
-                box |= QRect(x, y, 1, 1);
-        }
-    }
-    return box;
-}
-
-bool isColor(QRgb inPixel, const QColor& inColor)
-{
-    return qRed(inPixel) == inColor.red() && qGreen(inPixel) == inColor.green() &&
-           qBlue(inPixel) == inColor.blue();
-}
-
-class OptionCheckBox : public QCheckBox
-{
-public:
-    using QCheckBox::initStyleOption;
-};
+const int Box = 0, Menu = 1, Radio = 2; // the widgets of the check-mark table
 
 class OptionTabBar : public QTabBar
 {
@@ -120,24 +110,18 @@ private slots:
     void tabSpaceWithButtons();
     void largeMenuIcons_data();
     void largeMenuIcons();
-    void checkMarkFollowsBase_data();
-    void checkMarkFollowsBase();
-    void menuCheckMark_data();
-    void menuCheckMark();
+    void checkMarks_data();
+    void checkMarks();
     void checkBoxBackground_data();
     void checkBoxBackground();
-    void radioDot();
     void branchBox_data();
     void branchBox();
     void toolButtonLabelWithNegativeIconSize_data();
     void toolButtonLabelWithNegativeIconSize();
-    void progressBarFill_data();
     void progressBarFill();
     void disabledIconOnDarkScheme_data();
     void disabledIconOnDarkScheme();
-    void pixmapCacheKey();
     void pushButtonPanelCache();
-    void pushButtonsFollowSchemeSwitch();
 };
 
 void tst_Style::initTestCase()
@@ -145,13 +129,14 @@ void tst_Style::initTestCase()
     QApplication::setStyle(new ZuStyle);
     QVERIFY(appStyle());
     // The base is Cleanlooks when the plugin is installed (Debian: qt5-style-plugins).
-    QVERIFY(QStyleFactory::keys().contains(QStringLiteral("Cleanlooks"), Qt::CaseInsensitive));
     QCOMPARE(appStyle()->baseStyle()->metaObject()->className(), "QCleanlooksStyle");
-    QVERIFY(!QPixmap(QStringLiteral(":/CheckBoxCheckBlack")).isNull());
-    QCOMPARE(QPixmap(QStringLiteral(":/CheckBoxCheckWhite")).size(), QSize(32, 32));
-    QCOMPARE(QPixmap(QStringLiteral(":/RadioBoxCheck")).size(), QSize(10, 10));
-    QCOMPARE(QPixmap(QStringLiteral(":/BusyCursorMac")).size(), QSize(25, 37));
-    QCOMPARE(QPixmap(QStringLiteral(":/Tessel7")).size(), QSize(113, 49));
+    const QList<QPair<QString, QSize>> images = {{":/CheckBoxCheckBlack", QSize(32, 32)},
+                                                 {":/CheckBoxCheckWhite", QSize(32, 32)},
+                                                 {":/RadioBoxCheck", QSize(10, 10)},
+                                                 {":/BusyCursorMac", QSize(25, 37)},
+                                                 {":/Tessel7", QSize(113, 49)}};
+    for (const auto& image : images)
+        QCOMPARE(QPixmap(image.first).size(), image.second);
 }
 
 void tst_Style::dialogButtonsInWindowsOrderWithoutIcons()
@@ -162,10 +147,8 @@ void tst_Style::dialogButtonsInWindowsOrderWithoutIcons()
     QVERIFY(QTest::qWaitForWindowExposed(&box));
     QPushButton* ok = box.button(QDialogButtonBox::Ok);
     QPushButton* cancel = box.button(QDialogButtonBox::Cancel);
-    QVERIFY(ok && cancel);
     QVERIFY2(ok->geometry().right() < cancel->geometry().left(), "Ok must be left of Cancel");
-    QVERIFY(ok->icon().isNull());
-    QVERIFY(cancel->icon().isNull());
+    QVERIFY(ok->icon().isNull() && cancel->icon().isNull());
 }
 
 void tst_Style::boldTabLabelFromTabData_data()
@@ -173,12 +156,8 @@ void tst_Style::boldTabLabelFromTabData_data()
     QTest::addColumn<QVariant>("data");
     QTest::addColumn<bool>("bold");
     QTest::newRow("true") << QVariant(true) << true;
-    QTest::newRow("1") << QVariant(1) << true;
-    QTest::newRow("text true") << QVariant(QStringLiteral("true")) << true;
     QTest::newRow("false") << QVariant(false) << false;
     QTest::newRow("absent") << QVariant() << false;
-    QTest::newRow("text 0") << QVariant(QStringLiteral("0")) << false;
-    QTest::newRow("not a boolean") << QVariant(QPointF(1, 2)) << false;
 }
 
 void tst_Style::boldTabLabelFromTabData()
@@ -195,11 +174,11 @@ void tst_Style::boldTabLabelFromTabData()
     bar.setCurrentIndex(2); // the two compared tabs share the unselected look
     bar.resize(bar.sizeHint());
     const QImage image = grabImage(bar);
-    auto ink = [](QRgb pixel) {
+    const PixelTest text = [](QRgb pixel) {
         return qGray(pixel) < 100;
     };
-    const int first = countPixels(image, bar.tabRect(0), ink);
-    const int second = countPixels(image, bar.tabRect(1), ink);
+    const int first = ink(image, bar.tabRect(0), text).count;
+    const int second = ink(image, bar.tabRect(1), text).count;
     QVERIFY(second > 20);
     // A bold label gets a tab wide enough for bold text.
     QCOMPARE(bar.tabRect(0).width() > bar.tabRect(1).width(), bold);
@@ -230,34 +209,29 @@ void tst_Style::tabSpaceWithButtons()
     QStyleOptionTab option;
     option.leftButtonSize = left;
     option.rightButtonSize = right;
-    const std::unique_ptr<QStyle> cleanlooks(QStyleFactory::create(QStringLiteral("Cleanlooks")));
-    const int baseH = cleanlooks->pixelMetric(QStyle::PM_TabBarTabHSpace, &option);
-    const int baseV = cleanlooks->pixelMetric(QStyle::PM_TabBarTabVSpace, &option);
+    const int baseH = cleanlooks()->pixelMetric(QStyle::PM_TabBarTabHSpace, &option);
+    const int baseV = cleanlooks()->pixelMetric(QStyle::PM_TabBarTabVSpace, &option);
     QVERIFY(baseH != 8 && baseV != 4); // otherwise the test could not tell them apart
     QCOMPARE(appStyle()->pixelMetric(QStyle::PM_TabBarTabHSpace, &option), own ? 8 : baseH);
     QCOMPARE(appStyle()->pixelMetric(QStyle::PM_TabBarTabVSpace, &option), own ? 4 : baseV);
+    if (QTest::currentDataTag() != QLatin1String("close button right"))
+        return;
 
-    // The same through a real tab bar: the close button takes the place of the wide spacing.
-    if (QTest::currentDataTag() == QLatin1String("close button right")) {
-        QTabBar plain;
-        plain.setExpanding(false);
-        plain.addTab(QStringLiteral("Series"));
-        OptionTabBar closable;
-        closable.setExpanding(false);
-        closable.setTabsClosable(true);
-        closable.addTab(QStringLiteral("Series"));
-        QWidget* close = closable.tabButton(0, QTabBar::RightSide);
-        QVERIFY(close);
-        const int plainWidth = plain.tabRect(0).width();
-        const int closableWidth = closable.tabRect(0).width();
-        QCOMPARE(closableWidth - close->sizeHint().width(), plainWidth - baseH + 8 + 4);
-        // ... and its label still has room for the whole text.
-        QStyleOptionTab tabOption;
-        closable.initStyleOption(&tabOption, 0);
-        QVERIFY(
-            appStyle()->subElementRect(QStyle::SE_TabBarTabText, &tabOption, &closable).width() >=
+    // The same through a real tab bar: the close button takes the place of the wide spacing...
+    QTabBar plain;
+    plain.setExpanding(false);
+    plain.addTab(QStringLiteral("Series"));
+    OptionTabBar closable;
+    closable.setExpanding(false);
+    closable.setTabsClosable(true);
+    closable.addTab(QStringLiteral("Series"));
+    const int closeWidth = closable.tabButton(0, QTabBar::RightSide)->sizeHint().width();
+    QCOMPARE(closable.tabRect(0).width() - closeWidth, plain.tabRect(0).width() - baseH + 8 + 4);
+    // ... and its label still has room for the whole text.
+    QStyleOptionTab tabOption;
+    closable.initStyleOption(&tabOption, 0);
+    QVERIFY(appStyle()->subElementRect(QStyle::SE_TabBarTabText, &tabOption, &closable).width() >=
             closable.fontMetrics().horizontalAdvance(QStringLiteral("Series")));
-    }
 }
 
 void tst_Style::largeMenuIcons_data()
@@ -273,110 +247,91 @@ void tst_Style::largeMenuIcons()
     QFETCH(float, scale);
     QFETCH(int, large);
     sScale = scale;
-    ZuStyle::setIconScalingFunction(&testScaling);
-
+    ZuStyle::setIconScalingFunction([](const QWidget*) { return sScale; });
     QPixmap red(64, 64);
     red.fill(Qt::red);
-    const QIcon icon(red);
     ZuStyle::QLargeIconMenu largeMenu;
-    QAction* largeAction = largeMenu.addAction(icon, QStringLiteral("Large"));
+    QAction* largeAction = largeMenu.addAction(QIcon(red), QStringLiteral("Large"));
     QMenu plainMenu;
-    QAction* plainAction = plainMenu.addAction(icon, QStringLiteral("Plain"));
-    auto isRed = [](QRgb pixel) {
-        return isColor(pixel, Qt::red);
-    };
+    QAction* plainAction = plainMenu.addAction(QIcon(red), QStringLiteral("Plain"));
 
     plainMenu.resize(plainMenu.sizeHint());
-    QCOMPARE(boundingBox(grabImage(plainMenu), isRed).size(), QSize(16, 16));
-
+    QCOMPARE(ink(grabImage(plainMenu), plainMenu.rect(), is(Qt::red)).box.size(), QSize(16, 16));
     largeMenu.resize(largeMenu.sizeHint());
-    QCOMPARE(boundingBox(grabImage(largeMenu), isRed).size(), QSize(large, large));
+    QCOMPARE(ink(grabImage(largeMenu), largeMenu.rect(), is(Qt::red)).box.size(),
+             QSize(large, large));
     QVERIFY(largeMenu.actionGeometry(largeAction).height() >= large);
     QVERIFY(plainMenu.actionGeometry(plainAction).height() < 32);
     // Asked without a widget, the size is that of the menu drawn last.
     QCOMPARE(appStyle()->pixelMetric(QStyle::PM_SmallIconSize), large);
-    QCOMPARE(appStyle()->pixelMetric(QStyle::PM_ToolBarIconSize), 32);
 
     ZuStyle::setIconScalingFunction(nullptr);
     QCOMPARE(appStyle()->pixelMetric(QStyle::PM_SmallIconSize, nullptr, &largeMenu), 32);
 }
 
-void tst_Style::checkMarkFollowsBase_data()
+void tst_Style::checkMarks_data()
 {
+    QTest::addColumn<int>("kind");
     QTest::addColumn<QColor>("base");
     QTest::addColumn<bool>("checked");
     QTest::addColumn<int>("expected"); // -1 a darker mark, 1 a lighter mark, 0 none
-    QTest::newRow("white, checked") << QColor(Qt::white) << true << -1;
-    QTest::newRow("value 129, checked") << QColor(129, 129, 129) << true << -1;
-    QTest::newRow("value 128, checked") << QColor(128, 128, 128) << true << 1;
-    QTest::newRow("dark, checked") << QColor(40, 40, 40) << true << 1;
-    QTest::newRow("white, unchecked") << QColor(Qt::white) << false << 0;
-    QTest::newRow("dark, unchecked") << QColor(40, 40, 40) << false << 0;
+    QTest::newRow("box, white") << Box << QColor(Qt::white) << true << -1;
+    QTest::newRow("box, value 129") << Box << QColor(129, 129, 129) << true << -1;
+    QTest::newRow("box, value 128") << Box << QColor(128, 128, 128) << true << 1;
+    QTest::newRow("box, dark") << Box << QColor(40, 40, 40) << true << 1;
+    // Either mark's Off state is blank: an unchecked box shows no mark.
+    QTest::newRow("box, white, unchecked") << Box << QColor(Qt::white) << false << 0;
+    QTest::newRow("box, dark, unchecked") << Box << QColor(40, 40, 40) << false << 0;
+    // Menus draw the light mark, inverted (XOR) on a light scheme so that it shows dark.
+    QTest::newRow("menu, light") << Menu << QColor(Qt::white) << true << -1;
+    QTest::newRow("menu, dark") << Menu << QColor(40, 40, 40) << true << 1;
+    QTest::newRow("menu, unchecked") << Menu << QColor(Qt::white) << false << 0;
+    QTest::newRow("radio") << Radio << QColor(Qt::white) << true << -1;
+    QTest::newRow("radio, unchecked") << Radio << QColor(Qt::white) << false << 0;
 }
 
-void tst_Style::checkMarkFollowsBase()
+void tst_Style::checkMarks()
 {
+    QFETCH(int, kind);
     QFETCH(QColor, base);
     QFETCH(bool, checked);
     QFETCH(int, expected);
-    OptionCheckBox box;
-    box.setPalette(testPalette(base));
-    box.setChecked(checked);
-    box.resize(box.sizeHint());
-    const QImage image = grabImage(box);
-
-    QStyleOptionButton option;
-    box.initStyleOption(&option);
-    option.rect.adjust(2, 0, -2, 0); // the style draws check boxes narrowed by 2 pixels a side
-    const QRect inside = appStyle()
-                             ->subElementRect(QStyle::SE_CheckBoxIndicator, &option, &box)
-                             .adjusted(2, 2, -2, -2);
-    const int baseGrey = qGray(base.rgb());
-    const int darker = countPixels(image, inside, [&](QRgb p) { return qGray(p) < baseGrey - 60; });
-    const int lighter =
-        countPixels(image, inside, [&](QRgb p) { return qGray(p) > baseGrey + 60; });
-    QCOMPARE(darker > 3, expected < 0);
-    QCOMPARE(lighter > 3, expected > 0);
-}
-
-void tst_Style::menuCheckMark_data()
-{
-    QTest::addColumn<QColor>("base");
-    QTest::addColumn<QColor>("window");
-    QTest::addColumn<bool>("darkMark");
-    // On a light scheme the light mark is inverted (XOR) so that it shows as a dark mark.
-    QTest::newRow("light base") << QColor(Qt::white) << QColor(235, 235, 235) << true;
-    QTest::newRow("dark base") << QColor(40, 40, 40) << QColor(60, 60, 60) << false;
-}
-
-void tst_Style::menuCheckMark()
-{
-    QFETCH(QColor, base);
-    QFETCH(QColor, window);
-    QFETCH(bool, darkMark);
-    QMenu menu;
     QPalette palette = testPalette(base);
-    palette.setColor(QPalette::Window, window);
-    menu.setPalette(palette);
-    QAction* checked = menu.addAction(QStringLiteral("Show overlay"));
-    checked->setCheckable(true);
-    checked->setChecked(true);
-    QAction* unchecked = menu.addAction(QStringLiteral("Show ruler"));
-    unchecked->setCheckable(true);
-    menu.resize(menu.sizeHint());
-    const QImage image = grabImage(menu);
-
-    // The check column is the part of the item left of the text.
-    auto column = [&](QAction* action) {
-        const QRect item = menu.actionGeometry(action);
-        return QRect(item.left(), item.top(), 22, item.height());
-    };
-    auto mark = [&](QRgb p) {
-        return darkMark ? qGray(p) < qGray(window.rgb()) - 100
-                        : qGray(p) > qGray(window.rgb()) + 100;
-    };
-    QVERIFY(countPixels(image, column(checked), mark) > 5);
-    QCOMPARE(countPixels(image, column(unchecked), mark), 0);
+    palette.setColor(QPalette::Window, base); // the menu's check column
+    QImage image;
+    QRect inside; // where only the mark may differ from the base colour
+    if (kind == Menu) {
+        QMenu menu;
+        menu.setPalette(palette);
+        QAction* action = menu.addAction(QStringLiteral("Show overlay"));
+        action->setCheckable(true);
+        action->setChecked(checked);
+        menu.resize(menu.sizeHint());
+        image = grabImage(menu);
+        inside = menu.actionGeometry(action); // the check column, left of the text
+        inside.setWidth(22);
+    } else {
+        QCheckBox box;
+        QRadioButton radio;
+        QAbstractButton& button = kind == Box ? static_cast<QAbstractButton&>(box) : radio;
+        button.setPalette(palette);
+        button.setChecked(checked);
+        button.resize(button.sizeHint());
+        image = grabImage(button);
+        QStyleOptionButton option;
+        option.initFrom(&button);
+        option.rect.adjust(2, 0, -2, 0); // the style draws these narrowed by 2 pixels a side
+        inside = appStyle()
+                     ->subElementRect(kind == Box ? QStyle::SE_CheckBoxIndicator
+                                                  : QStyle::SE_RadioButtonIndicator,
+                                      &option, &button)
+                     .adjusted(3, 3, -3, -3);
+    }
+    const int grey = qGray(base.rgb());
+    QCOMPARE(ink(image, inside, [&](QRgb p) { return qGray(p) < grey - 60; }).count > 3,
+             expected < 0);
+    QCOMPARE(ink(image, inside, [&](QRgb p) { return qGray(p) > grey + 60; }).count > 3,
+             expected > 0);
 }
 
 void tst_Style::checkBoxBackground_data()
@@ -386,6 +341,7 @@ void tst_Style::checkBoxBackground_data()
     QTest::addColumn<QColor>("fill");
     const int enabled = QStyle::State_Enabled;
     const int hover = QStyle::State_MouseOver;
+    // Active Window is red, Inactive Window green, Button blue.
     QTest::newRow("checked") << true << enabled << QColor(Qt::red);
     QTest::newRow("unchecked") << false << enabled << QColor(Qt::green);
     QTest::newRow("hover") << false << (enabled | hover) << QColor(Qt::blue);
@@ -411,25 +367,7 @@ void tst_Style::checkBoxBackground()
         appStyle()->drawControl(QStyle::CE_CheckBox, &option, &painter, &box);
     });
     // The two columns the drawing leaves free on the right show the fill.
-    QVERIFY(isColor(image.pixel(79, 10), fill));
-    QVERIFY(isColor(image.pixel(78, 2), fill));
-}
-
-void tst_Style::radioDot()
-{
-    QRadioButton on;
-    on.setPalette(testPalette());
-    on.setChecked(true);
-    on.resize(on.sizeHint());
-    QRadioButton off;
-    off.setPalette(testPalette());
-    off.resize(off.sizeHint());
-    // The dot image is blue; nothing else of the button is.
-    auto blue = [](QRgb p) {
-        return qBlue(p) > 150 && qRed(p) < 120;
-    };
-    QVERIFY(countPixels(grabImage(on), on.rect(), blue) >= 12);
-    QCOMPARE(countPixels(grabImage(off), off.rect(), blue), 0);
+    QCOMPARE(ink(image, QRect(78, 0, 2, 20), is(fill)).count, 40);
 }
 
 void tst_Style::branchBox_data()
@@ -440,8 +378,8 @@ void tst_Style::branchBox_data()
     QTest::newRow("20x20 closed") << QSize(20, 20) << false << 15;
     QTest::newRow("20x20 open") << QSize(20, 20) << true << 15;
     QTest::newRow("21x40") << QSize(21, 40) << false << 15;
-    QTest::newRow("30x16") << QSize(30, 16) << false << 11;
-    QTest::newRow("12x12 at least 9") << QSize(12, 12) << false << 9;
+    QTest::newRow("30x16, odd") << QSize(30, 16) << false << 11;
+    QTest::newRow("12x12, at least 9") << QSize(12, 12) << false << 9;
 }
 
 void tst_Style::branchBox()
@@ -456,32 +394,24 @@ void tst_Style::branchBox()
     option.palette = testPalette();
     option.palette.setColor(QPalette::Dark, Qt::blue);
     option.palette.setColor(QPalette::Text, Qt::red);
-    const QImage image = drawn(size, [&](QPainter& painter) {
-        appStyle()->drawPrimitive(QStyle::PE_IndicatorBranch, &option, &painter);
-    });
-    const QRect box = boundingBox(image, [](QRgb p) { return isColor(p, Qt::blue); });
+    auto draw = [&](QStyle* style) {
+        return drawn(size, [&](QPainter& painter) {
+            style->drawPrimitive(QStyle::PE_IndicatorBranch, &option, &painter);
+        });
+    };
+    const QImage image = draw(appStyle());
+    const QRect box = ink(image, image.rect(), is(Qt::blue)).box;
     QCOMPARE(box.size(), QSize(side, side));
     QCOMPARE(box.center(), option.rect.center());
     // Minus while open, plus while closed.
-    const int midX = box.left() + side / 2;
-    const int midY = box.top() + side / 2;
-    const int vertical = countPixels(image, QRect(midX, box.top(), 1, side),
-                                     [&](QRgb p) { return isColor(p, Qt::red); });
-    const int horizontal = countPixels(image, QRect(box.left(), midY, side, 1),
-                                       [&](QRgb p) { return isColor(p, Qt::red); });
-    QCOMPARE(horizontal, side - 4);
-    QCOMPARE(vertical, open ? 1 : side - 4);
+    const QPoint middle = box.topLeft() + QPoint(side / 2, side / 2);
+    QCOMPARE(ink(image, QRect(box.left(), middle.y(), side, 1), is(Qt::red)).count, side - 4);
+    QCOMPARE(ink(image, QRect(middle.x(), box.top(), 1, side), is(Qt::red)).count,
+             open ? 1 : side - 4);
 
     // Items without children are drawn as Cleanlooks draws them.
     option.state &= ~QStyle::State_Children;
-    const std::unique_ptr<QStyle> cleanlooks(QStyleFactory::create(QStringLiteral("Cleanlooks")));
-    const QImage leaf = drawn(size, [&](QPainter& painter) {
-        appStyle()->drawPrimitive(QStyle::PE_IndicatorBranch, &option, &painter);
-    });
-    const QImage reference = drawn(size, [&](QPainter& painter) {
-        cleanlooks->drawPrimitive(QStyle::PE_IndicatorBranch, &option, &painter);
-    });
-    QCOMPARE(leaf, reference);
+    QCOMPARE(draw(appStyle()), draw(cleanlooks().get()));
 }
 
 void tst_Style::toolButtonLabelWithNegativeIconSize_data()
@@ -510,38 +440,29 @@ void tst_Style::toolButtonLabelWithNegativeIconSize()
     const QImage image = ::drawn(QSize(80, 24), [&](QPainter& painter) {
         appStyle()->drawControl(QStyle::CE_ToolButtonLabel, &option, &painter);
     });
-    const int painted =
-        countPixels(image, image.rect(), [](QRgb p) { return p != qRgb(255, 255, 255); });
-    QCOMPARE(painted > 0, drawn);
-}
-
-void tst_Style::progressBarFill_data()
-{
-    QTest::addColumn<bool>("inverted");
-    QTest::newRow("left to right") << false;
-    QTest::newRow("inverted") << true;
+    QCOMPARE(ink(image, image.rect(), is(Qt::white)).count < 80 * 24, drawn);
 }
 
 void tst_Style::progressBarFill()
 {
-    QFETCH(bool, inverted);
-    QProgressBar bar;
     QPalette palette = testPalette();
     palette.setColor(QPalette::Highlight, QColor(0, 160, 0));
-    bar.setPalette(palette);
-    bar.setTextVisible(false);
-    bar.setRange(0, 200);
-    bar.setValue(50);
-    bar.setInvertedAppearance(inverted);
-    bar.resize(200, 20);
-    const QImage image = grabImage(bar);
     auto green = [](QRgb p) {
         return qGreen(p) > qRed(p) + 60;
     };
-    const int leftHalf = countPixels(image, QRect(0, 0, 100, 20), green);
-    const int rightHalf = countPixels(image, QRect(100, 0, 100, 20), green);
-    QVERIFY((inverted ? rightHalf : leftHalf) > 200);
-    QCOMPARE(inverted ? leftHalf : rightHalf, 0);
+    for (bool inverted : {false, true}) {
+        QProgressBar bar;
+        bar.setPalette(palette);
+        bar.setTextVisible(false);
+        bar.setRange(0, 200);
+        bar.setValue(50);
+        bar.setInvertedAppearance(inverted);
+        bar.resize(200, 20);
+        const QImage image = grabImage(bar);
+        const int filled = ink(image, QRect(inverted ? 100 : 0, 0, 100, 20), green).count;
+        QVERIFY2(filled > 200, inverted ? "inverted" : "left to right");
+        QCOMPARE(ink(image, QRect(inverted ? 0 : 100, 0, 100, 20), green).count, 0);
+    }
 }
 
 void tst_Style::disabledIconOnDarkScheme_data()
@@ -552,21 +473,21 @@ void tst_Style::disabledIconOnDarkScheme_data()
     QTest::addColumn<QColor>("pixel");
     QTest::addColumn<QColor>("expected"); // invalid: the common style's result
     const int disabled = QIcon::Disabled;
-    QTest::newRow("dark base") << QColor(100, 100, 100) << QColor(60, 60, 60) << disabled
-                               << QColor(150, 90, 30) << QColor(78, 78, 78); // 270/15 + 60
+    const QColor darkBase(100, 100, 100);
+    const QColor darkButton(60, 60, 60);
+    QTest::newRow("dark base") << darkBase << darkButton << disabled << QColor(150, 90, 30)
+                               << QColor(78, 78, 78); // 270/15 + 60
     QTest::newRow("dark base, coloured button")
         << QColor(20, 30, 40) << QColor(10, 20, 40) << disabled << QColor(15, 15, 15)
         << QColor(26, 26, 26); // 45/15 + 70/3
-    QTest::newRow("half transparent") << QColor(100, 100, 100) << QColor(60, 60, 60) << disabled
+    QTest::newRow("half transparent") << darkBase << darkButton << disabled
                                       << QColor(255, 255, 255, 128) << QColor(111, 111, 111, 128);
-    QTest::newRow("light button, clamped")
-        << QColor(40, 40, 40) << QColor(250, 250, 250) << disabled << QColor(255, 255, 255)
-        << QColor(255, 255, 255);
-    QTest::newRow("light base") << QColor(200, 200, 200) << QColor(60, 60, 60) << disabled
+    QTest::newRow("light button, clamped") << QColor(40, 40, 40) << QColor(250, 250, 250)
+                                           << disabled << QColor(Qt::white) << QColor(Qt::white);
+    QTest::newRow("light base") << QColor(200, 200, 200) << darkButton << disabled
                                 << QColor(150, 90, 30) << QColor();
     QTest::newRow("dark base, normal mode")
-        << QColor(100, 100, 100) << QColor(60, 60, 60) << int(QIcon::Normal) << QColor(150, 90, 30)
-        << QColor();
+        << darkBase << darkButton << int(QIcon::Normal) << QColor(150, 90, 30) << QColor();
 }
 
 void tst_Style::disabledIconOnDarkScheme()
@@ -585,23 +506,17 @@ void tst_Style::disabledIconOnDarkScheme()
     source.fill(pixel);
     QStyleOption option;
     option.palette = palette;
-    const QImage result = appStyle()
-                              ->generatedIconPixmap(QIcon::Mode(mode), source, &option)
-                              .toImage()
-                              .convertToFormat(QImage::Format_ARGB32);
+    auto argb = [](const QPixmap& pixmap) {
+        return pixmap.toImage().convertToFormat(QImage::Format_ARGB32);
+    };
+    const QImage result = argb(appStyle()->generatedIconPixmap(QIcon::Mode(mode), source, &option));
     // A disabled icon drawn anywhere in the application goes the same way.
-    const QImage viaIcon = QIcon(source)
-                               .pixmap(QSize(8, 8), QIcon::Mode(mode))
-                               .toImage()
-                               .convertToFormat(QImage::Format_ARGB32);
+    const QImage viaIcon = argb(QIcon(source).pixmap(QSize(8, 8), QIcon::Mode(mode)));
     QApplication::setPalette(saved);
 
     if (!expected.isValid()) {
-        QCommonStyle common;
-        const QImage reference = common.generatedIconPixmap(QIcon::Mode(mode), source, &option)
-                                     .toImage()
-                                     .convertToFormat(QImage::Format_ARGB32);
-        QCOMPARE(result, reference);
+        QCOMPARE(result,
+                 argb(QCommonStyle().generatedIconPixmap(QIcon::Mode(mode), source, &option)));
         return;
     }
     for (const QImage& image : {result, viaIcon}) {
@@ -612,27 +527,17 @@ void tst_Style::disabledIconOnDarkScheme()
     }
 }
 
-void tst_Style::pixmapCacheKey()
+void tst_Style::pushButtonPanelCache()
 {
-    QStyleOption plain;
-    plain.state = QStyle::State_Enabled | QStyle::State_Raised;
-    plain.direction = Qt::RightToLeft;
-    const qint64 key = plain.palette.cacheKey();
-    QCOMPARE(ZuStyle::pixmapCacheKey(QStringLiteral("pushbutton-0"), &plain, QSize(75, 23)),
-             QStringLiteral("pushbutton-0-3-1-%1-75x23").arg(key));
-
     QStyleOptionSpinBox spin;
     spin.state = QStyle::State_Enabled;
-    spin.direction = Qt::LeftToRight;
+    spin.direction = Qt::RightToLeft;
     spin.buttonSymbols = QAbstractSpinBox::PlusMinus;
     spin.stepEnabled = QAbstractSpinBox::StepUpEnabled | QAbstractSpinBox::StepDownEnabled;
     spin.frame = false;
     QCOMPARE(ZuStyle::pixmapCacheKey(QStringLiteral("spinbox"), &spin, QSize(10, 20)),
-             QStringLiteral("spinbox-1-0-%1-10x20-1-3-0").arg(spin.palette.cacheKey()));
-}
+             QStringLiteral("spinbox-1-1-%1-10x20-1-3-0").arg(spin.palette.cacheKey()));
 
-void tst_Style::pushButtonPanelCache()
-{
     QStyleOptionButton option;
     option.rect = QRect(0, 0, 80, 30);
     option.state = QStyle::State_Enabled | QStyle::State_Raised;
@@ -656,49 +561,16 @@ void tst_Style::pushButtonPanelCache()
     QPixmap marker(80, 30);
     marker.fill(Qt::magenta);
     QPixmapCache::insert(key, marker);
-    QVERIFY(isColor(draw().pixel(40, 15), Qt::magenta));
-
+    QCOMPARE(draw().pixelColor(40, 15), QColor(Qt::magenta));
     // A plain button has a key of its own.
     option.features = QStyleOptionButton::None;
-    QVERIFY(!isColor(draw().pixel(40, 15), Qt::magenta));
+    QVERIFY(draw().pixelColor(40, 15) != QColor(Qt::magenta));
     option.features = QStyleOptionButton::DefaultButton;
 
     // Polishing the application (a scheme switch) throws the renderings away.
     appStyle()->polish(qApp);
     QVERIFY(!QPixmapCache::find(key, &cached));
     QCOMPARE(draw(), first);
-}
-
-void tst_Style::pushButtonsFollowSchemeSwitch()
-{
-    QTemporaryDir dir;
-    QVERIFY(dir.isValid());
-    for (const auto& scheme : {std::make_pair("Reddish", QColor(220, 60, 60)),
-                               std::make_pair("Bluish", QColor(60, 60, 220))}) {
-        QFile file(dir.filePath(QLatin1String(scheme.first) + QStringLiteral(".xml")));
-        QVERIFY(file.open(QIODevice::WriteOnly));
-        file.write(QStringLiteral("<ColorScheme Version=\"1.0\" Name=\"%1\"><Active>"
-                                  "<Color Id=\"Button\" Red=\"%2\" Green=\"%3\" Blue=\"%4\"/>"
-                                  "</Active></ColorScheme>")
-                       .arg(QLatin1String(scheme.first))
-                       .arg(scheme.second.red())
-                       .arg(scheme.second.green())
-                       .arg(scheme.second.blue())
-                       .toUtf8());
-    }
-    ZuStyleFactory& factory = ZuStyleFactory::instance();
-    QCOMPARE(factory.addStylesFromPath(dir.path()), 2);
-
-    QPushButton button;
-    button.resize(90, 30);
-    factory.setCurrentStyle(QStringLiteral("Reddish"));
-    QVERIFY(appStyle());
-    QColor centre = grabImage(button).pixelColor(45, 15);
-    QVERIFY2(centre.red() > centre.blue() + 80, qPrintable(centre.name()));
-
-    factory.setCurrentStyle(QStringLiteral("Bluish"));
-    centre = grabImage(button).pixelColor(45, 15);
-    QVERIFY2(centre.blue() > centre.red() + 80, qPrintable(centre.name()));
 }
 
 QTEST_MAIN(tst_Style)

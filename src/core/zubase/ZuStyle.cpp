@@ -115,6 +115,18 @@ bool hasTabButtons(const QStyleOption* inOption)
     return atLeastOne(tab->leftButtonSize) || atLeastOne(tab->rightButtonSize);
 }
 
+// Check box and radio button indicators: a Dark frame around Base, or around Button while
+// pressed. Saves the painter; the caller restores it.
+void beginIndicator(QPainter* inPainter, const QStyleOption* inOption, bool inAntialiased)
+{
+    inPainter->save();
+    inPainter->setRenderHint(QPainter::Antialiasing, inAntialiased);
+    const bool pressed =
+        (inOption->state & QStyle::State_Sunken) && (inOption->state & QStyle::State_Enabled);
+    inPainter->setPen(inOption->palette.color(QPalette::Dark));
+    inPainter->setBrush(inOption->palette.brush(pressed ? QPalette::Button : QPalette::Base));
+}
+
 } // namespace
 
 ZuStyle::QLargeIconMenu::QLargeIconMenu(QWidget* inParent) : QMenu(inParent) {}
@@ -351,11 +363,7 @@ void ZuStyle::drawPrimitive(PrimitiveElement inElement, const QStyleOption* inOp
         return;
     }
     case PE_IndicatorCheckBox: {
-        inPainter->save();
-        inPainter->setRenderHint(QPainter::Antialiasing, false);
-        const bool pressed = (inOption->state & State_Sunken) && enabled;
-        inPainter->setPen(pal.color(QPalette::Dark));
-        inPainter->setBrush(pal.brush(pressed ? QPalette::Button : QPalette::Base));
+        beginIndicator(inPainter, inOption, false);
         inPainter->drawRect(r.adjusted(0, 0, -1, -1));
         if (inOption->state & State_NoChange) {
             inPainter->fillRect(r.adjusted(3, r.height() / 2 - 1, -3, -(r.height() / 2 - 1)),
@@ -370,11 +378,7 @@ void ZuStyle::drawPrimitive(PrimitiveElement inElement, const QStyleOption* inOp
         return;
     }
     case PE_IndicatorRadioButton: {
-        inPainter->save();
-        inPainter->setRenderHint(QPainter::Antialiasing, true);
-        const bool pressed = (inOption->state & State_Sunken) && enabled;
-        inPainter->setPen(pal.color(QPalette::Dark));
-        inPainter->setBrush(pal.brush(pressed ? QPalette::Button : QPalette::Base));
+        beginIndicator(inPainter, inOption, true);
         inPainter->drawEllipse(QRectF(r).adjusted(0.5, 0.5, -0.5, -0.5));
         if (inOption->state & State_On)
             state().radioDot.paint(inPainter, r, Qt::AlignCenter, QIcon::Normal, QIcon::Off);

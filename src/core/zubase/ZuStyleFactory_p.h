@@ -38,6 +38,10 @@ class ZuStyleFactoryPrivate
 {
 public:
     static ZuStyleFactoryPrivate* get(ZuStyleFactory& inFactory) { return inFactory.d.get(); }
+    // A factory beside the process-wide one, so that white-box tests can watch what its set-up
+    // and tear-down do to the application (the observer hook). Main thread, after the app.
+    static ZuStyleFactory* createDetached() { return new ZuStyleFactory; }
+    static void destroyDetached(ZuStyleFactory* inFactory) { delete inFactory; }
 
     QMap<QString, ZuColorScheme> schemes;
     QString currentName;
