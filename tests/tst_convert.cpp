@@ -262,7 +262,7 @@ void TestConvert::messageHandler_data()
     row("warning", QtWarningMsg, "default", "w", 2, "default: w");
     row("critical", QtCriticalMsg, "zu.test", "c", 3, "zu.test: c");
     row("fatal", QtFatalMsg, nullptr, "f", 4, "f");
-    row("unknown type", QtMsgType(42), nullptr, "u", 3, "u");
+    row("unknown type", QtMsgType(7), nullptr, "u", 3, "u");
     row("percent signs stay", QtCriticalMsg, nullptr, "100% %s %d", 3, "100% %s %d");
     row("empty category", QtWarningMsg, "", "e", 2, "e");
 }
