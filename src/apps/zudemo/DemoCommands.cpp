@@ -1,95 +1,56 @@
 #include "DemoCommands.h"
 
+namespace {
+
+template <typename T> RkHandle<ZuBase::Command> make()
+{
+    return new T;
+}
+
+} // namespace
+
 namespace DemoCommands {
 
 void registerAll()
 {
-    ZuBase::Command::registerFactory(QStringLiteral("help"), &HelpCommand::make);
-    ZuBase::Command::registerFactory(QStringLiteral("screenshot"), &ScreenshotCommand::make);
-    ZuBase::Command::registerFactory(QStringLiteral("quit"), &QuitCommand::make);
-    ZuBase::Command::registerFactory(QStringLiteral("scheme"), &SchemeCommand::make);
+    ZuBase::Command::registerFactory(QStringLiteral("help"), &make<HelpCommand>);
+    ZuBase::Command::registerFactory(QStringLiteral("screenshot"), &make<ScreenshotCommand>);
+    ZuBase::Command::registerFactory(QStringLiteral("quit"), &make<QuitCommand>);
+    ZuBase::Command::registerFactory(QStringLiteral("scheme"), &make<SchemeCommand>);
 }
 
 } // namespace DemoCommands
 
-RkHandle<ZuBase::Command> HelpCommand::make()
+QString DemoCommand::value(const char* inName, bool inExactlyOnce, RkResult& outResult) const
 {
-    return new HelpCommand;
+    RkHandle<Attribute> attribute;
+    outResult = attribute1(attribute, QString::fromLatin1(inName), inExactlyOnce);
+    return attribute.isNotNull() ? attribute->value() : QString();
 }
+
+HelpCommand::HelpCommand()
+    : DemoCommand("Prints this text, or the help of one command.",
+                  "    command=NAME   the command to describe (optional)\n")
+{}
 
 RkResult HelpCommand::execute()
 {
-    RkHandle<Attribute> command;
-    const RkResult res = attribute1(command, QStringLiteral("command"), false);
-    ZuBase::Command::usage(command.isNotNull() ? command->value() : QString(), true);
+    RkResult res;
+    const QString command = value("command", false, res);
+    ZuBase::Command::usage(command, true);
     return res;
 }
 
-const char* HelpCommand::description() const
-{
-    return "Prints this text, or the help of one command.";
-}
+ScreenshotCommand::ScreenshotCommand()
+    : DemoCommand("Writes the main window to a PNG file and quits.",
+                  "    file=PATH      the PNG file to write (required)\n")
+{}
 
-const char* HelpCommand::detailedDescription() const
-{
-    return "    command=NAME   the command to describe (optional)\n";
-}
+QuitCommand::QuitCommand()
+    : DemoCommand("Closes the window right after it was shown.", "    (no attributes)\n")
+{}
 
-RkHandle<ZuBase::Command> ScreenshotCommand::make()
-{
-    return new ScreenshotCommand;
-}
-
-const char* ScreenshotCommand::description() const
-{
-    return "Writes the main window to a PNG file and quits.";
-}
-
-const char* ScreenshotCommand::detailedDescription() const
-{
-    return "    file=PATH      the PNG file to write (required)\n";
-}
-
-QString ScreenshotCommand::fileName(RkResult& outResult) const
-{
-    RkHandle<Attribute> file;
-    outResult = attribute1(file, QStringLiteral("file"), true);
-    return file.isNotNull() ? file->value() : QString();
-}
-
-RkHandle<ZuBase::Command> QuitCommand::make()
-{
-    return new QuitCommand;
-}
-
-const char* QuitCommand::description() const
-{
-    return "Closes the window right after it was shown.";
-}
-
-const char* QuitCommand::detailedDescription() const
-{
-    return "    (no attributes)\n";
-}
-
-RkHandle<ZuBase::Command> SchemeCommand::make()
-{
-    return new SchemeCommand;
-}
-
-const char* SchemeCommand::description() const
-{
-    return "Starts with the given colour scheme.";
-}
-
-const char* SchemeCommand::detailedDescription() const
-{
-    return "    name=NAME      the scheme's name, e.g. \"Tessel Dark\" (required)\n";
-}
-
-QString SchemeCommand::schemeName(RkResult& outResult) const
-{
-    RkHandle<Attribute> name;
-    outResult = attribute1(name, QStringLiteral("name"), true);
-    return name.isNotNull() ? name->value() : QString();
-}
+SchemeCommand::SchemeCommand()
+    : DemoCommand("Starts with the given colour scheme.",
+                  "    name=NAME      the scheme's name, e.g. \"Tessel Dark\" (required)\n")
+{}

@@ -11,50 +11,54 @@ void registerAll();
 
 } // namespace DemoCommands
 
-// --help [command=NAME]: prints the general usage or that of one command.
-class HelpCommand : public ZuBase::Command
+// Base of the demo's commands: fixed help texts, nothing to run unless a command says otherwise.
+class DemoCommand : public ZuBase::Command
 {
 public:
-    static RkHandle<ZuBase::Command> make();
-    RkResult execute() override;
-    const char* description() const override;
-    const char* detailedDescription() const override;
+    DemoCommand(const char* inDescription, const char* inDetails)
+        : mDescription(inDescription), mDetails(inDetails)
+    {}
+    RkResult execute() override { return RkResult(); }
+    const char* description() const override { return mDescription; }
+    const char* detailedDescription() const override { return mDetails; }
     RkResult finish() override { return RkResult(); }
+
+protected:
+    // The value of the attribute inName (checked to occur exactly once, or at most once).
+    QString value(const char* inName, bool inExactlyOnce, RkResult& outResult) const;
+
+private:
+    const char* mDescription;
+    const char* mDetails;
+};
+
+// --help [command=NAME]: prints the general usage or that of one command.
+class HelpCommand : public DemoCommand
+{
+public:
+    HelpCommand();
+    RkResult execute() override;
 };
 
 // --screenshot file=PATH: writes the main window to a PNG file and quits.
-class ScreenshotCommand : public ZuBase::Command
+class ScreenshotCommand : public DemoCommand
 {
 public:
-    static RkHandle<ZuBase::Command> make();
-    RkResult execute() override { return RkResult(); }
-    const char* description() const override;
-    const char* detailedDescription() const override;
-    RkResult finish() override { return RkResult(); }
-    // The file named by the "file" attribute.
-    QString fileName(RkResult& outResult) const;
+    ScreenshotCommand();
+    QString fileName(RkResult& outResult) const { return value("file", true, outResult); }
 };
 
 // --quit: closes the window right after showing it (for scripted runs).
-class QuitCommand : public ZuBase::Command
+class QuitCommand : public DemoCommand
 {
 public:
-    static RkHandle<ZuBase::Command> make();
-    RkResult execute() override { return RkResult(); }
-    const char* description() const override;
-    const char* detailedDescription() const override;
-    RkResult finish() override { return RkResult(); }
+    QuitCommand();
 };
 
 // --scheme name=NAME: the colour scheme to start with (default "Tessel Light").
-class SchemeCommand : public ZuBase::Command
+class SchemeCommand : public DemoCommand
 {
 public:
-    static RkHandle<ZuBase::Command> make();
-    RkResult execute() override { return RkResult(); }
-    const char* description() const override;
-    const char* detailedDescription() const override;
-    RkResult finish() override { return RkResult(); }
-    // The scheme named by the "name" attribute.
-    QString schemeName(RkResult& outResult) const;
+    SchemeCommand();
+    QString schemeName(RkResult& outResult) const { return value("name", true, outResult); }
 };
