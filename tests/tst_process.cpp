@@ -385,9 +385,14 @@ void TestProcess::imageAndModules()
     child.mArguments = QStringList{"30000"};
     QVERIFY(child.start(false, true, false).isOk());
     child.resume();
-    QTRY_COMPARE(
-        QFileInfo(QStringLiteral("/proc/%1/exe").arg(child.processId())).canonicalFilePath(),
-        childExe);
+    // The kernel names the new image before it has mapped it: wait until the child's mapping
+    // of its executable exists.
+    const auto childModules = [&child] {
+        QStringList list;
+        child.modules(list);
+        return list;
+    };
+    QTRY_COMPARE(childModules().value(0), childExe);
     const QSharedPointer<ZuBase::Process> self = ZuBase::Process::self();
     QCOMPARE(self->processId(), unsigned(getpid()));
     const QString selfExe = QFileInfo(QCoreApplication::applicationFilePath()).canonicalFilePath();
