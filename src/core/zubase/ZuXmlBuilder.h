@@ -16,8 +16,9 @@ class ZUBASE_EXPORT ZuXmlBuilder
 {
 public:
     // An element of a builder's document. addChild() moves down, the other add... calls stay on
-    // the same element, parent() moves up. An element without a builder (default-constructed or
-    // the parent of a root) ignores every add... call and hands out null elements.
+    // the same element, parent() moves up. A default-constructed element has no builder: it
+    // ignores every add... call and hands out null elements. The parent of a root is null but
+    // keeps the builder, so children added to it are made but belong to no parent.
     class ZUBASE_EXPORT Element
     {
     public:
