@@ -506,6 +506,7 @@ void TestFile::junctionInfo_data()
 
     // A link made elsewhere with a relative target reports it from the link's folder.
     QTest::newRow("link with a relative target") << "relative" << true << "target dir";
+    QTest::newRow("link whose target has gone") << "gone" << true << "removed dir";
     QTest::newRow("plain folder") << "target dir" << true << "";
     QTest::newRow("file") << "target dir/file.txt" << false << "";
     QTest::newRow("missing") << "missing" << false << "";
@@ -520,6 +521,7 @@ void TestFile::junctionInfo()
     QTemporaryDir root;
     makeFile(root.filePath("target dir/file.txt"));
     QVERIFY(QFile::link("target dir", root.filePath("relative")));
+    QVERIFY(QFile::link(root.filePath("removed dir"), root.filePath("gone")));
 
     RkLogCapture capture;
     bool isJunction = true;

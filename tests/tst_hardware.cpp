@@ -27,15 +27,20 @@ const QString sSample =
     QStringLiteral(ZUBASE_TEST_DATA_DIR "/files/dmidecode/desktop-ami-2007.txt");
 const QString sProbe = QStringLiteral(ZUBASE_TEST_HELPER_DIR "/zubase_hwprobe");
 
-// A fake DMI tool: prints the given file for exactly "-q", complains otherwise.
-void writeTool(const QString& inPath, const QString& inOutputFile)
+// A fake DMI tool: prints the given file for exactly "-q", complains otherwise. A file name
+// behind "hang:" is printed and the tool then does not end.
+void writeTool(const QString& inPath, QString inOutputFile)
 {
+    const bool hang = inOutputFile.startsWith("hang:");
+    if (hang)
+        inOutputFile.remove(0, 5);
     QFile tool(inPath);
     QVERIFY(tool.open(QIODevice::WriteOnly));
     tool.write("#!/bin/sh\n"
                "if [ \"$#\" -eq 1 ] && [ \"$1\" = \"-q\" ]; then cat '" +
                inOutputFile.toLocal8Bit() +
-               "'; else echo 'BIOS Information'; echo 'Vendor: wrong arguments'; fi\n");
+               "'; else echo 'BIOS Information'; echo 'Vendor: wrong arguments'; fi\n" +
+               (hang ? "exec sleep 60\n" : ""));
     tool.close();
     QVERIFY(tool.setPermissions(tool.permissions() | QFile::ExeOwner | QFile::ExeGroup |
                                 QFile::ExeOther));
@@ -121,6 +126,7 @@ void TestHardware::hardwareTypeFromTool_data()
     QTest::newRow("dmidecode") << QStringList{"dmidecode", sSample} << real;
     QTest::newRow("dmidecode.exe first")
         << QStringList{"dmidecode.exe", sSample, "dmidecode", "/dev/null"} << real;
+    QTest::newRow("tool that does not end") << QStringList{"dmidecode", "hang:" + sSample} << real;
     QTest::newRow("no tool") << QStringList() << QStringList{"N/A", "N/A", "N/A"};
     QTest::newRow("tool prints binary garbage")
         << QStringList{"dmidecode", "/bin/sh"} << QStringList{"N/A", "N/A", "N/A"};

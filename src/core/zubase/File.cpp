@@ -210,7 +210,10 @@ RkResult junctionInfo(const QString& inPath, bool& outIsJunction, QString& outTa
     RkResult res;
     outIsJunction = false;
     outTarget.clear();
-    if (inPath.isEmpty() || !QFileInfo(inPath).isDir()) {
+    // A junction whose target has gone is still a junction to inspect (and to clean up).
+    const QFileInfo info(inPath);
+    const bool danglingLink = info.isSymLink() && !info.exists();
+    if (inPath.isEmpty() || !(info.isDir() || danglingLink)) {
         res.makeBad(1);
         return res;
     }

@@ -36,7 +36,8 @@ ZUBASE_EXPORT RkResult removeDir(const QString& inDirPath, bool inRecursive,
 // Makes inJunctionPath a junction to inTargetPath. An empty directory already there is
 // replaced; a non-empty one is refused. A directory made here is removed again on failure.
 ZUBASE_EXPORT RkResult junctionCreate(const QString& inJunctionPath, const QString& inTargetPath);
-// Whether the directory inPath is a junction, and its target. Bad when inPath is no directory.
+// Whether the directory inPath is a junction, and its target. Bad when inPath is no directory;
+// a junction whose target has gone still counts.
 ZUBASE_EXPORT RkResult junctionInfo(const QString& inPath, bool& outIsJunction, QString& outTarget);
 // True when both paths name the same existing file (after resolving links, "." and "..").
 ZUBASE_EXPORT bool pathsPointToTheSameFile(const QString& inPath1, const QString& inPath2);

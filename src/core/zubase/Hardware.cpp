@@ -97,12 +97,14 @@ void getHardwareType(QString& outProductName, QString& outSerialNumber, QString&
     process.start(tool, QStringList() << QStringLiteral("-q"), QIODevice::ReadWrite);
     if (!process.waitForStarted(5000))
         return;
-    if (!process.waitForFinished(10000)) {
+    // A tool that has not finished in time still gives what it has printed so far.
+    process.waitForFinished(10000);
+    const QByteArray output = process.readAllStandardOutput();
+    if (process.state() != QProcess::NotRunning) {
         process.kill();
         process.waitForFinished(1000);
-        return;
     }
-    parseDmiDecodeOutput(process.readAllStandardOutput(), outProductName, outSerialNumber, outBios);
+    parseDmiDecodeOutput(output, outProductName, outSerialNumber, outBios);
 }
 
 RkResult getDiskFreeSpaceMB(const QString& inPath, unsigned int& outFreeMB, float& outUsedPercent)

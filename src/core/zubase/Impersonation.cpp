@@ -296,7 +296,9 @@ void* Win32Impersonation::win32Login(QString& inUser, QString& inPassword)
 {
     const LogonName logon = splitLogonName(inUser);
     const std::string pamUser = Q2M(pamUserName(logon)).toStdString();
-    // The password only lives in these buffers for the call and is wiped after it.
+    // The password only lives in these buffers for the call and is wiped after it. It goes in
+    // the local 8-bit encoding, as the account database stores it here: Latin-1 would turn
+    // every character beyond it into '?' and let such passwords collide.
     QByteArray passwordBytes = inPassword.toLocal8Bit();
     std::string password(passwordBytes.constData(), static_cast<std::size_t>(passwordBytes.size()));
     wipe(passwordBytes);
