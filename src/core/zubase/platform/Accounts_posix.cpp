@@ -445,10 +445,14 @@ template <typename Id, typename Entry>
 int lookupName(int (*inLookup)(Id, Entry*, char*, std::size_t, Entry**), char* Entry::*inName,
                Id inId, const char* inDomain, std::string& outDomain, std::string& outName)
 {
+    // Groups with long member lists need more than the usual buffer: grow it on ERANGE.
     std::vector<char> buffer(16384);
     Entry entry;
     Entry* found = nullptr;
-    const int rc = inLookup(inId, &entry, buffer.data(), buffer.size(), &found);
+    int rc;
+    while ((rc = inLookup(inId, &entry, buffer.data(), buffer.size(), &found)) == ERANGE &&
+           buffer.size() < (std::size_t(1) << 24))
+        buffer.resize(buffer.size() * 2);
     if (rc != 0)
         return rc;
     if (!found)
