@@ -76,10 +76,13 @@ QStringList shownLines(const RkLogCapture& inCapture)
 class Provider : public ZuApplication::DefaultParentProvider
 {
 public:
-    explicit Provider(QWidget* inWidget) : mWidget(inWidget) {}
+    explicit Provider(QWidget* inWidget) : mWidget(inWidget) { ++sLiving; }
+    ~Provider() override { --sLiving; }
     QWidget* defaultParent() const override { return mWidget; }
     QPointer<QWidget> mWidget;
+    static int sLiving;
 };
+int Provider::sLiving = 0;
 
 // A dialog of class T found as the modal widget; inAction runs on it.
 template <class T> Act on(std::function<void(T*)> inAction)
@@ -144,7 +147,16 @@ void TestDialogs::defaultParent()
     QCOMPARE(box.parentWidget(), &other);
     QVERIFY(box.windowFlags() & Qt::WindowStaysOnTopHint);
 
+    // The provider held already, handed in again, stays alive and in use.
+    ZuApplication* app = ZuApplication::instance();
+    QCOMPARE(Provider::sLiving, 1);
+    app->setDefaultParentProvider(
+        const_cast<ZuApplication::DefaultParentProvider*>(&app->defaultParentProvider()));
+    QCOMPARE(Provider::sLiving, 1);
+    QCOMPARE(app->defaultParentProvider().defaultParent(), mMain.get());
+
     ZuApplication::instance()->setDefaultParentProvider(nullptr);
+    QCOMPARE(Provider::sLiving, 0);
     ZuProgressDialog orphan;
     QCOMPARE(orphan.parentWidget(), nullptr);
 }

@@ -186,7 +186,7 @@ void tst_StyleFactory::schemePalettes()
         QCOMPARE(p.color(QPalette::Inactive, r), p.color(QPalette::Active, r));
     }
     // First entry per id wins; only the first UserDefined element counts.
-    QCOMPARE(full->userDefinedColors.keys(), QStringList({"PanelBackground", "PanelText"}));
+    QCOMPARE(full->userDefinedColors.keys(), QStringList({"", "PanelBackground", "PanelText"}));
     QCOMPARE(full->userDefinedColors.value(QStringLiteral("PanelBackground")), QColor(11, 22, 33));
 
     // An empty Inactive element keeps the starting Inactive colours.
@@ -295,7 +295,7 @@ void tst_StyleFactory::setCurrentStyleSignalsOnce()
     QCOMPARE(factory.userDefinedColor(QStringLiteral("PanelBackground"), Qt::red),
              QColor(11, 22, 33));
     QCOMPARE(factory.userDefinedColor(QStringLiteral("panelbackground"), Qt::red), QColor(Qt::red));
-    QCOMPARE(factory.userDefinedColor(QString(), Qt::blue), QColor(Qt::blue));
+    QCOMPARE(factory.userDefinedColor(QString(), Qt::blue), QColor(77, 77, 77)); // exact match
 
     // A file read now takes the roles it leaves out from the scheme in force.
     QVERIFY(factory.addStyle(
@@ -437,20 +437,24 @@ void tst_StyleFactory::themeChangeObserver()
 
 void tst_StyleFactory::styledWidgetColours_data()
 {
+    QTest::addColumn<bool>("named");        // names set at all
     QTest::addColumn<QByteArray>("suffix"); // of "PanelText<suffix>", "PanelBackground<suffix>"
     QTest::addColumn<bool>("defaults");     // red text and blue background
     QTest::addColumn<QColor>("foreground");
     QTest::addColumn<QColor>("background");
     const QColor text(5, 6, 0), base(250, 251, 252); // the scheme's Text and Base
     QTest::newRow("names defined")
-        << QByteArray() << true << QColor(240, 230, 220) << QColor(11, 22, 33);
+        << true << QByteArray() << true << QColor(240, 230, 220) << QColor(11, 22, 33);
     QTest::newRow("unknown names, defaults")
-        << QByteArray("X") << true << QColor(Qt::red) << QColor(Qt::blue);
-    QTest::newRow("unknown names, no defaults") << QByteArray("X") << false << text << base;
+        << true << QByteArray("X") << true << QColor(Qt::red) << QColor(Qt::blue);
+    QTest::newRow("unknown names, no defaults") << true << QByteArray("X") << false << text << base;
+    // The scheme keeps an entry without Id under the empty name; unnamed widgets ignore it.
+    QTest::newRow("no names, no defaults") << false << QByteArray() << false << text << base;
 }
 
 void tst_StyleFactory::styledWidgetColours()
 {
+    QFETCH(bool, named);
     QFETCH(QByteArray, suffix);
     QFETCH(bool, defaults);
     QFETCH(QColor, foreground);
@@ -458,8 +462,10 @@ void tst_StyleFactory::styledWidgetColours()
     ZuStyleFactory::instance().setCurrentStyle(QStringLiteral("Full"));
     QWidget widget;
     ZuStyledWidget styled(&widget);
-    styled.setForegroundColorName("PanelText" + suffix);
-    styled.setBackgroundColorName("PanelBackground" + suffix);
+    if (named) {
+        styled.setForegroundColorName("PanelText" + suffix);
+        styled.setBackgroundColorName("PanelBackground" + suffix);
+    }
     styled.setForegroundColorDefault(defaults ? QColor(Qt::red) : QColor());
     styled.setBackgroundColorDefault(defaults ? QColor(Qt::blue) : QColor());
 

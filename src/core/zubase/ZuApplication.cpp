@@ -416,6 +416,9 @@ const ZuApplication::DefaultParentProvider& ZuApplication::defaultParentProvider
 
 void ZuApplication::setDefaultParentProvider(DefaultParentProvider* inProvider)
 {
+    // Handing back the provider held already must not delete it from under ourselves.
+    if (inProvider == mDefaultParentProvider.get())
+        return;
     mDefaultParentProvider.reset(inProvider);
 }
 

@@ -75,7 +75,7 @@ public:
 
     // Never dangling: when no provider is set, a base provider (no parent) is made.
     const DefaultParentProvider& defaultParentProvider();
-    // Takes ownership; the previous provider is deleted.
+    // Takes ownership; the previous provider is deleted (not when it is handed in again).
     void setDefaultParentProvider(DefaultParentProvider* inProvider);
 
     // Takes ownership, deleting the previous splash screen; a new one is shown and painted

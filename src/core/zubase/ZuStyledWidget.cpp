@@ -13,8 +13,14 @@ void ZuStyledWidgetPrivate::slotApplyColorScheme()
         mForegroundDefault.isValid() ? mForegroundDefault : palette.color(QPalette::Text);
     const QColor backgroundFallback =
         mBackgroundDefault.isValid() ? mBackgroundDefault : palette.color(QPalette::Base);
-    const QColor foreground = factory.userDefinedColor(mForegroundName, foregroundFallback);
-    const QColor background = factory.userDefinedColor(mBackgroundName, backgroundFallback);
+    // No name means the fallback, even in a scheme that keeps an entry without an Id (stored
+    // under the empty name): a widget nobody named colours for must not pick it up.
+    const QColor foreground = mForegroundName.isEmpty()
+                                  ? foregroundFallback
+                                  : factory.userDefinedColor(mForegroundName, foregroundFallback);
+    const QColor background = mBackgroundName.isEmpty()
+                                  ? backgroundFallback
+                                  : factory.userDefinedColor(mBackgroundName, backgroundFallback);
     palette.setBrush(QPalette::All, QPalette::Base, QBrush(background, Qt::SolidPattern));
     palette.setBrush(QPalette::All, QPalette::WindowText, QBrush(foreground, Qt::SolidPattern));
     palette.setBrush(QPalette::All, QPalette::Text, QBrush(foreground, Qt::SolidPattern));
