@@ -36,4 +36,3 @@ inline QStringList failureLines(const RkLogCapture& inCapture)
 }
 
 } // namespace TestSupport
-

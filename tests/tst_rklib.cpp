@@ -544,6 +544,5 @@ void TestRkLib::threadWaitTimesOut()
     QVERIFY(looper.passes > 0);
 }
 
-
 QTEST_GUILESS_MAIN(TestRkLib)
 #include "tst_rklib.moc"
