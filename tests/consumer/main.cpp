@@ -1,28 +1,18 @@
-// A host built outside the tree against an installed zubase.
-#include <zubase/Command.h>
+// A host built outside the tree that uses only application-frame classes: nothing of rklib
+// is referenced by the host itself, so the linker drops it, and libzubase must find it alone.
+#include <zubase/ZuApplication.h>
+#include <zubase/ZuDesktop.h>
 
 #include <cstdio>
+#include <vector>
 
-namespace {
-class Hello : public ZuBase::Command
+int main(int argc, char** argv, char** envp)
 {
-public:
-    static RkHandle<ZuBase::Command> make() { return new Hello; }
-    RkResult execute() override { return RkResult(); }
-    const char* description() const override { return "says hello"; }
-    const char* detailedDescription() const override { return "no attributes"; }
-    RkResult finish() override { return RkResult(); }
-};
-} // namespace
-
-int main(int argc, char** argv)
-{
-    ZuBase::Command::registerFactory(QStringLiteral("hello"), &Hello::make);
-    QStringList args;
-    for (int i = 1; i < argc; ++i)
-        args << QString::fromLocal8Bit(argv[i]);
-    RkDArray<RkHandle<ZuBase::Command>> commands;
-    const RkResult res = ZuBase::Command::parseCommands(args, commands);
-    std::printf("parsed %d command(s), %s\n", commands.size(), res.isOk() ? "ok" : "bad");
-    return res.isOk() && commands.size() == 1 ? 0 : 1;
+    ZuApplication* app = ZuApplication::createInstance(argc, argv, envp);
+    std::vector<ZuDesktop::DisplayInfo> displays;
+    const int count = ZuDesktop::getDisplayInfo(displays, nullptr);
+    std::printf("application %s, %d display(s)\n",
+                app && ZuApplication::isMainThread() ? "ok" : "missing", count);
+    delete app;
+    return count > 0 ? 0 : 1;
 }

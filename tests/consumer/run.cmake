@@ -1,8 +1,12 @@
-# Installs the build tree into a scratch prefix, then configures, builds and runs a tiny host
-# against it with find_package(zubase CONFIG).
+cmake_policy(VERSION 3.16)
+# A host outside the tree: configured, built and run against this build tree, then against an
+# install into a scratch prefix, each time without LD_LIBRARY_PATH. The install must hold the
+# public headers flat and nothing internal.
 file(REMOVE_RECURSE ${WORK_DIR})
 file(MAKE_DIRECTORY ${WORK_DIR})
 set(prefix ${WORK_DIR}/prefix)
+unset(ENV{LD_LIBRARY_PATH})
+set(ENV{QT_QPA_PLATFORM} offscreen)
 
 function(run_step)
     execute_process(COMMAND ${ARGN} RESULT_VARIABLE rc OUTPUT_VARIABLE out ERROR_VARIABLE err)
@@ -12,13 +16,28 @@ function(run_step)
     set(last_output "${out}" PARENT_SCOPE)
 endfunction()
 
+function(build_and_run label prefix_path)
+    set(build ${WORK_DIR}/build-${label})
+    run_step(${CMAKE_COMMAND} -S ${CONSUMER_DIR} -B ${build}
+        -DCMAKE_PREFIX_PATH=${prefix_path} -DCMAKE_BUILD_TYPE=Release)
+    run_step(${CMAKE_COMMAND} --build ${build})
+    run_step(${build}/consumer)
+    if(NOT last_output MATCHES "application ok, [1-9][0-9]* display\\(s\\)")
+        message(FATAL_ERROR "${label}: unexpected consumer output: ${last_output}")
+    endif()
+    message(STATUS "${label}: ${last_output}")
+endfunction()
+
+build_and_run(buildtree ${BUILD_DIR})
+
 run_step(${CMAKE_COMMAND} --install ${BUILD_DIR} --prefix ${prefix})
-run_step(${CMAKE_COMMAND} -S ${CONSUMER_DIR} -B ${WORK_DIR}/build
-    -DCMAKE_PREFIX_PATH=${prefix} -DCMAKE_BUILD_TYPE=Release)
-run_step(${CMAKE_COMMAND} --build ${WORK_DIR}/build)
-set(ENV{LD_LIBRARY_PATH} "${prefix}/lib:${prefix}/lib/x86_64-linux-gnu:$ENV{LD_LIBRARY_PATH}")
-run_step(${WORK_DIR}/build/consumer --hello)
-if(NOT last_output MATCHES "parsed 1 command\\(s\\), ok")
-    message(FATAL_ERROR "unexpected consumer output: ${last_output}")
+file(GLOB installed RELATIVE ${prefix}/include/zubase ${prefix}/include/zubase/*)
+foreach(name IN LISTS installed)
+    if(name MATCHES "_p\\.h$|^Sys|^platform$|^ReparseBuffer|^HandleTable|^ZuCheck")
+        message(FATAL_ERROR "internal header installed: ${name}")
+    endif()
+endforeach()
+if(NOT "ZuApplication.h" IN_LIST installed OR NOT "zubase_export.h" IN_LIST installed)
+    message(FATAL_ERROR "public headers missing from the install: ${installed}")
 endif()
-message(STATUS "consumer: ${last_output}")
+build_and_run(install ${prefix})

@@ -65,9 +65,16 @@ std::string sourceFamily(const char* inFile)
             c = '/';
     }
     const std::size_t src = path.rfind("src/core/");
-    if (src != std::string::npos)
+    if (src != std::string::npos) {
+        // "src/core/<library>/<family folder>/File.cpp" names the file as
+        // "src/core/<library>/File": family folders sort the sources, the recorded location stays
+        // what it always was.
         path.erase(0, src);
-    else if (const std::size_t slash = path.rfind('/'); slash != std::string::npos)
+        const std::size_t library = path.find('/', std::strlen("src/core/"));
+        const std::size_t base = path.rfind('/');
+        if (library != std::string::npos && base > library)
+            path.erase(library, base - library);
+    } else if (const std::size_t slash = path.rfind('/'); slash != std::string::npos)
         path.erase(0, slash + 1);
     const std::size_t dot = path.rfind('.');
     if (dot != std::string::npos && path.find('/', dot) == std::string::npos)

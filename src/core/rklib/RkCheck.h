@@ -25,7 +25,8 @@ namespace Rk {
 
 // "ZuBase::File::readAll" out of a __PRETTY_FUNCTION__ text.
 RKLIB_EXPORT std::string qualifiedFunctionName(const char* inPrettyFunction);
-// "src/core/zubase/File" out of a __FILE__ text (any prefix before src/ and the extension dropped).
+// "src/core/zubase/File" out of a __FILE__ text (any prefix before src/, family folders below the
+// library folder and the extension dropped).
 RKLIB_EXPORT std::string sourceFamily(const char* inFile);
 // The where text of a check: sourceFamily(file) + ":" + qualifiedFunctionName(function).
 RKLIB_EXPORT std::string checkWhere(const char* inFile, const char* inPrettyFunction);

@@ -1,0 +1,258 @@
+#include "zubase/File.h"
+
+#include "zubase/Impersonation.h"
+#include "zubase/ZuCheck_p.h"
+#include "zubase/platform/SysFiles.h"
+#include "zubase/platform/ReparseBuffer.h"
+
+#include <QDir>
+#include <QFile>
+#include <QFileInfo>
+
+namespace {
+
+const char* const sCategory = "ZuBase";
+
+// Absolute, with native separators; empty stays empty.
+QString nativeAbsolutePath(const QString& inPath)
+{
+    if (inPath.isEmpty())
+        return QString();
+    return QDir::toNativeSeparators(QFileInfo(inPath).absoluteFilePath());
+}
+
+std::u16string toU16(const QString& inText)
+{
+    return std::u16string(reinterpret_cast<const char16_t*>(inText.utf16()),
+                          static_cast<std::size_t>(inText.size()));
+}
+
+QString fromU16(const std::u16string& inText)
+{
+    return QString::fromUtf16(inText.data(), static_cast<int>(inText.size()));
+}
+
+void traceRemoval(const char* inFormat, const QString& inPath, bool inGone)
+{
+    getTheLogInstance().tracef(inGone ? RkLogInfo : RkLogWarning, sCategory, inFormat,
+                               Q2M(inPath).constData(), inGone ? "ok" : "fail");
+}
+
+void* const sCurrentProcessToken = reinterpret_cast<void*>(static_cast<intptr_t>(-1));
+
+// Opens a directory's reparse point, with the restore privilege raised first as writing or
+// reading one may need it.
+int openMountPoint(const std::string& inPath, ZuPlatform::ReparseHandle& outHandle)
+{
+    ZuBase::win32TokenAdjustPrivilege(sCurrentProcessToken, const_cast<char*>("SeRestorePrivilege"),
+                                      true);
+    return ZuPlatform::filesOpenReparsePoint(inPath, outHandle);
+}
+
+} // namespace
+
+namespace ZuBase::File {
+
+RkResult readAll(const QString& inFilePath, QByteArray& outBuffer)
+{
+    RkResult res;
+    outBuffer.clear();
+    QFile file(inFilePath);
+    res << RK_CHECK(file.exists(), "file.exists()", "Internal Error");
+    if (res.isBad())
+        return res;
+    res << RK_CHECK(file.open(QIODevice::ReadOnly), "file.open( QIODevice::ReadOnly )",
+                    Q2M(inFilePath));
+    if (res.isBad())
+        return res;
+    outBuffer = file.readAll();
+    res << RK_CHECK(file.size() == outBuffer.size(), "file.size()==outBuffer.size()",
+                    "Internal Error");
+    if (res.isBad())
+        outBuffer.clear();
+    return res;
+}
+
+RkResult writeAll(const QString& inFilePath, const QByteArray& inData)
+{
+    RkResult res;
+    QFile file(inFilePath);
+    // Unbuffered: a buffered QFile only meets a full disk when it flushes on close, where the
+    // failure would be lost and the caller told that the data was written.
+    res << RK_CHECK(file.open(QIODevice::WriteOnly | QIODevice::Truncate | QIODevice::Unbuffered),
+                    "file.open( QIODevice::WriteOnly | QIODevice::Truncate )", Q2M(inFilePath));
+    if (res.isBad())
+        return res;
+    res << writeAll(file, inData);
+    return res;
+}
+
+RkResult writeAll(QIODevice& inDevice, const QByteArray& inData)
+{
+    return writeAll(inDevice, const_cast<char*>(inData.constData()), inData.size());
+}
+
+RkResult writeAll(QIODevice& inDevice, void* inData, qint64 inSize)
+{
+    RkResult res;
+    const char* data = static_cast<const char*>(inData);
+    qint64 remaining = inSize;
+    while (remaining > 0) {
+        const qint64 numBytesDone = inDevice.write(data, remaining);
+        if (Tz::fail(RK_CHECK(numBytesDone > 0, "numBytesDone > 0", "Internal Error"))) {
+            res.makeBad(1);
+            return res;
+        }
+        data += numBytesDone;
+        remaining -= numBytesDone;
+    }
+    return res;
+}
+
+RkResult removeFile(const QString& inFilePath)
+{
+    RkResult res;
+    if (!QFile::exists(inFilePath))
+        return res;
+    QFile::remove(inFilePath);
+    traceRemoval("QFile::remove() [%s] -> %s", inFilePath, !QFile::exists(inFilePath));
+    if (Tz::fail(
+            RK_CHECK(!QFile::exists(inFilePath), "!QFile::exists(inFilePath)", "Internal Error")))
+        res.makeBad(1);
+    return res;
+}
+
+RkResult removeDir(const QString& inDirPath, bool inRecursive, const QStringList& inNameFilters,
+                   const QStringList& inKeepFilters)
+{
+    RkResult res;
+    // An empty directory, a file or a link goes at once.
+    QDir().rmdir(inDirPath);
+    QDir().remove(inDirPath);
+    const QFileInfo self(inDirPath);
+    if (!self.exists() && !self.isSymLink())
+        return res;
+
+    QFileInfoList entries;
+    QFileInfoList kept;
+    if (!self.isSymLink()) {
+        const QDir dir(inDirPath);
+        const QDir::Filters filter =
+            QDir::Files | QDir::AllDirs | QDir::Hidden | QDir::System | QDir::NoDotAndDotDot;
+        entries = dir.entryInfoList(inNameFilters, filter, QDir::Unsorted);
+        if (!inKeepFilters.isEmpty())
+            kept = dir.entryInfoList(inKeepFilters, filter, QDir::Unsorted);
+    }
+    for (int i = entries.size() - 1; i >= 0; --i) {
+        const QFileInfo& entry = entries.at(i);
+        if (kept.contains(entry))
+            continue;
+        // A link to a directory counts as a directory: removeDir() drops the link itself.
+        if (entry.isDir()) {
+            if (inRecursive)
+                removeDir(entry.absoluteFilePath(), inRecursive, inNameFilters, inKeepFilters);
+            continue;
+        }
+        const QString path = entry.absoluteFilePath();
+        QFile::remove(path);
+        traceRemoval("QFile::remove() [%s] -> %s", path,
+                     !QFileInfo(path).exists() && !QFileInfo(path).isSymLink());
+    }
+
+    QDir().rmdir(inDirPath);
+    traceRemoval("QDir::rmdir() [%s] -> %s", inDirPath, !QFileInfo::exists(inDirPath));
+    return res;
+}
+
+RkResult junctionCreate(const QString& inJunctionPath, const QString& inTargetPath)
+{
+    RkResult res;
+    const QString junctionPath = nativeAbsolutePath(inJunctionPath);
+    const QString targetPath = nativeAbsolutePath(inTargetPath);
+    if (junctionPath.isEmpty() || targetPath.isEmpty()) {
+        res.makeBad(1);
+        return res;
+    }
+    const std::string path = Q2M(junctionPath).toStdString();
+    ZuPlatform::ReparseHandle hDirMountPoint;
+
+    const int createError = ZuPlatform::filesCreateDirectory(path);
+    const bool bret = createError == 0;
+    if (!bret && createError != EEXIST) {
+        if (Tz::failWin(RK_CHECK(bret, "bret", "::CreateDirectoryW"), createError)) {
+            res.makeBad(1);
+            return res;
+        }
+    }
+    const bool createdHere = bret;
+
+    const int openError = openMountPoint(path, hDirMountPoint);
+    if (Tz::failWin(
+            RK_CHECK(openError == 0, "hDirMountPoint!=((HANDLE)(LONG_PTR)-1)", "::CreateFileW"),
+            openError)) {
+        res.makeBad(1);
+    } else {
+        const std::vector<std::uint8_t> buffer =
+            ZuPlatform::mountPointBuild(ZuPlatform::mountPointSubstituteName(toU16(targetPath)));
+        const int setError = ZuPlatform::filesSetReparsePoint(hDirMountPoint, buffer);
+        if (Tz::failWin(RK_CHECK(setError == 0, "bret!=0", "::DeviceIoControl"), setError))
+            res.makeBad(1);
+    }
+    ZuPlatform::filesCloseReparsePoint(hDirMountPoint);
+
+    if (res.isBad() && createdHere)
+        ZuPlatform::filesRemoveDirectory(path);
+    return res;
+}
+
+RkResult junctionInfo(const QString& inPath, bool& outIsJunction, QString& outTarget)
+{
+    RkResult res;
+    outIsJunction = false;
+    outTarget.clear();
+    // A junction whose target has gone is still a junction to inspect (and to clean up).
+    const QFileInfo info(inPath);
+    const bool danglingLink = info.isSymLink() && !info.exists();
+    if (inPath.isEmpty() || !(info.isDir() || danglingLink)) {
+        res.makeBad(1);
+        return res;
+    }
+    const std::string path = Q2M(nativeAbsolutePath(inPath)).toStdString();
+    ZuPlatform::ReparseHandle hDirMountPoint;
+    const int openError = openMountPoint(path, hDirMountPoint);
+    if (Tz::failWin(
+            RK_CHECK(openError == 0, "hDirMountPoint!=((HANDLE)(LONG_PTR)-1)", "::CreateFileW"),
+            openError)) {
+        res.makeBad(1);
+        return res;
+    }
+    std::vector<std::uint8_t> buffer;
+    const int getError = ZuPlatform::filesGetReparsePoint(hDirMountPoint, buffer);
+    if (getError != ZuPlatform::kFilesNotAReparsePoint) {
+        if (Tz::failWin(RK_CHECK(getError == 0, "bret!=0", "::DeviceIoControl"), getError)) {
+            res.makeBad(1);
+        } else {
+            std::uint32_t tag = 0;
+            std::u16string substituteName;
+            if (ZuPlatform::reparseBufferParse(buffer.data(), buffer.size(), tag, substituteName) &&
+                tag == ZuPlatform::kReparseTagMountPoint) {
+                outIsJunction = true;
+                outTarget = fromU16(ZuPlatform::mountPointTarget(substituteName));
+            }
+        }
+    }
+    ZuPlatform::filesCloseReparsePoint(hDirMountPoint);
+    return res;
+}
+
+bool pathsPointToTheSameFile(const QString& inPath1, const QString& inPath2)
+{
+    // The files themselves, not only their folders: two files side by side are not the same.
+    const QString canonical1 = QFileInfo(inPath1).canonicalFilePath();
+    const QString canonical2 = QFileInfo(inPath2).canonicalFilePath();
+    if (canonical1.isEmpty() || canonical2.isEmpty())
+        return false;
+    return canonical1 == canonical2;
+}
+
+} // namespace ZuBase::File

@@ -1,0 +1,441 @@
+// Accounts: logon through the host's callback, per-thread impersonation with a real account,
+// privileges and the token dump.
+#include "TestSupport.h"
+#include "zubase/Impersonation.h"
+#include "zubase/system/Impersonation_p.h"
+
+#include <QFile>
+#include <QFileInfo>
+#include <QHostInfo>
+#include <QProcess>
+#include <QSemaphore>
+#include <QStandardPaths>
+#include <QTemporaryDir>
+#include <QtTest>
+
+#include <grp.h>
+#include <pwd.h>
+#include <sys/stat.h>
+#include <sys/syscall.h>
+#include <thread>
+#include <unistd.h>
+
+using TestSupport::logLines;
+
+namespace {
+
+void* const sProcessToken = reinterpret_cast<void*>(static_cast<intptr_t>(-1));
+
+QString sUser;
+QString sPassword;
+int sCallbackCalls = 0;
+
+void credentials(QString& outUser, QString& outPassword)
+{
+    ++sCallbackCalls;
+    outUser = sUser;
+    outPassword = sPassword;
+}
+
+// The lines of the token dump: information lines without a category.
+QStringList dumpLines(const RkLogCapture& inCapture)
+{
+    return logLines(inCapture, "", RkLogInfo);
+}
+
+// A group line of the token dump; inAccount is "<domain>\\<name>".
+QString groupLine(gid_t inGid, const QString& inAccount, bool inPrimary)
+{
+    return QStringLiteral("        [S-1-22-2-%1]  [%2]  [ SE_GROUP_MANDATORY "
+                          "SE_GROUP_ENABLED_BY_DEFAULT SE_GROUP_ENABLED%3]")
+        .arg(inGid)
+        .arg(inAccount, inPrimary ? " SE_GROUP_OWNER" : "");
+}
+
+QString unixGroup(gid_t inGid)
+{
+    const group* entry = ::getgrgid(inGid);
+    return "Unix Group\\\\" + QString::fromLocal8Bit(entry ? entry->gr_name : "");
+}
+
+bool run(const QString& inProgram, const QStringList& inArgs, const QByteArray& inInput = {})
+{
+    QProcess process;
+    process.start(inProgram, inArgs);
+    if (!process.waitForStarted(10000))
+        return false;
+    process.write(inInput);
+    process.closeWriteChannel();
+    return process.waitForFinished(30000) && process.exitStatus() == QProcess::NormalExit &&
+           process.exitCode() == 0;
+}
+
+bool createFile(const QString& inPath)
+{
+    QFile file(inPath);
+    return file.open(QIODevice::WriteOnly) && file.write("x") == 1;
+}
+
+} // namespace
+
+class TestImpersonation : public QObject
+{
+    Q_OBJECT
+
+private slots:
+    void initTestCase();
+    void cleanupTestCase();
+    void splitLogonName_data();
+    void splitLogonName();
+    void groupFlags_data();
+    void groupFlags();
+    void tokenLogOfProcess();
+    void tokenLogOfNoToken();
+    void tokenLogOfUnnamedGroup();
+    void adjustPrivilege();
+    void loginWithoutCallbackOrPassword();
+    void logonOfRealAccount();
+    void impersonationIsPerThread();
+    void impersonateFailure();
+
+private:
+    bool mRoot = false;
+    bool mAccountMade = false;
+    uid_t mUid = 0;
+    gid_t mGid = 0;
+};
+
+void TestImpersonation::initTestCase()
+{
+    mRoot = ::geteuid() == 0;
+    if (!mRoot)
+        return;
+    const QString useradd = QStandardPaths::findExecutable("useradd", {"/usr/sbin", "/sbin"});
+    const QString chpasswd = QStandardPaths::findExecutable("chpasswd", {"/usr/sbin", "/sbin"});
+    if (useradd.isEmpty() || chpasswd.isEmpty())
+        return;
+    // A throwaway account with one supplementary group.
+    sUser = QStringLiteral("zutst%1").arg(::getpid());
+    sPassword = QStringLiteral("Pw-%1-secret").arg(::getpid());
+    mAccountMade = run(useradd, {"-M", "-s", "/usr/sbin/nologin", "-G", "users", sUser}) &&
+                   run(chpasswd, {}, (sUser + ':' + sPassword + '\n').toLocal8Bit());
+    if (const passwd* entry = ::getpwnam(qPrintable(sUser))) {
+        mUid = entry->pw_uid;
+        mGid = entry->pw_gid;
+    } else {
+        mAccountMade = false;
+    }
+}
+
+void TestImpersonation::cleanupTestCase()
+{
+    if (!sUser.isEmpty() && ::getpwnam(qPrintable(sUser)))
+        run(QStandardPaths::findExecutable("userdel", {"/usr/sbin", "/sbin"}), {sUser});
+}
+
+void TestImpersonation::splitLogonName_data()
+{
+    QTest::addColumn<QString>("user");
+    QTest::addColumn<QString>("name");
+    QTest::addColumn<QString>("domain");
+    QTest::addColumn<QString>("pamUser");
+
+    const auto row = [](const QString& inUser, const QString& inName, const QString& inDomain,
+                        const QString& inPamUser) {
+        QTest::newRow(qPrintable(inUser)) << inUser << inName << inDomain << inPamUser;
+    };
+    const QString host = QHostInfo::localHostName();
+    row("CORP\\alice", "alice", "CORP", "CORP\\alice");
+    row("CORP\\a\\b", "a\\b", "CORP", "CORP\\a\\b"); // the first backslash splits
+    row(".\\alice", "alice", ".", "alice");
+    row(host + "\\alice", "alice", host, "alice"); // this machine is local
+    row(host.toUpper() + "\\alice", "alice", host.toUpper(), "alice");
+    row("alice@corp.example", "alice@corp.example", "", "alice@corp.example");
+    row("alice", "alice", ".", "alice");
+}
+
+void TestImpersonation::splitLogonName()
+{
+    QFETCH(QString, user);
+    QFETCH(QString, name);
+    QFETCH(QString, domain);
+    QFETCH(QString, pamUser);
+    const ZuBase::LogonName logon = ZuBase::splitLogonName(user);
+    QCOMPARE(logon.name, name);
+    QCOMPARE(logon.domain, domain);
+    QCOMPARE(logon.hasDomain, !domain.isEmpty());
+    QCOMPARE(ZuBase::pamUserName(logon), pamUser);
+}
+
+void TestImpersonation::groupFlags_data()
+{
+    QTest::addColumn<uint>("attributes");
+    QTest::addColumn<QString>("flags");
+    QTest::newRow("none") << 0u << "";
+    QTest::newRow("logon id") << 0xC0000007u
+                              << " SE_GROUP_MANDATORY SE_GROUP_ENABLED_BY_DEFAULT "
+                                 "SE_GROUP_ENABLED SE_GROUP_LOGON_ID";
+    QTest::newRow("either logon id bit") << 0x40000000u << " SE_GROUP_LOGON_ID";
+    QTest::newRow("every flag in table order")
+        << 0xE000007Fu
+        << " SE_GROUP_MANDATORY SE_GROUP_ENABLED_BY_DEFAULT SE_GROUP_ENABLED SE_GROUP_OWNER "
+           "SE_GROUP_USE_FOR_DENY_ONLY SE_GROUP_INTEGRITY SE_GROUP_INTEGRITY_ENABLED "
+           "SE_GROUP_LOGON_ID SE_GROUP_RESOURCE";
+}
+
+void TestImpersonation::groupFlags()
+{
+    QFETCH(uint, attributes);
+    QFETCH(QString, flags);
+    QCOMPARE(ZuBase::groupFlagsText(attributes), flags);
+    // The dumps below show whole group lines; privileges in lower-case hex, unpadded.
+    QCOMPARE(ZuBase::privilegeText("SeBackupPrivilege", 0xE000001A),
+             QString("SeBackupPrivilege  [0xe000001a]"));
+}
+
+void TestImpersonation::tokenLogOfProcess()
+{
+    RkLogCapture capture;
+    ZuBase::win32TokenLog("process", sProcessToken);
+    const QStringList lines = dumpLines(capture);
+    QCOMPARE(lines.mid(0, 3), QStringList({"<token> [process]", "    <TokenGroups>",
+                                           groupLine(::getegid(), unixGroup(::getegid()), true)}));
+    const int groupsEnd = lines.indexOf("    </TokenGroups>");
+    QVERIFY(groupsEnd > 2);
+    QCOMPARE(lines.at(groupsEnd + 1), QString("    <TokenPrivileges>"));
+    QCOMPARE(lines.mid(lines.size() - 2),
+             QStringList({"    </TokenPrivileges>", "</token> [process]"}));
+    const QStringList privileges = lines.mid(groupsEnd + 2, lines.size() - groupsEnd - 4);
+    QCOMPARE(privileges.filter(QRegularExpression(R"(^        \S+  \[0x[0-9a-f]+\]$)")),
+             privileges);
+    if (mRoot) {
+        QVERIFY(privileges.contains("        SeRestorePrivilege  [0x2]"));
+        QVERIFY(privileges.contains("        cap_kill  [0x2]"));
+    }
+    QCOMPARE(logLines(capture, nullptr, RkLogError), QStringList());
+}
+
+void TestImpersonation::tokenLogOfNoToken()
+{
+    RkLogCapture capture;
+    ZuBase::win32TokenLog("none", nullptr);
+    QCOMPARE(dumpLines(capture),
+             QStringList({"<token> [none]", "    <TokenGroups>", "    </TokenGroups>",
+                          "    <TokenPrivileges>", "    </TokenPrivileges>", "</token> [none]"}));
+    const QStringList errors = logLines(capture, nullptr, RkLogError);
+    QCOMPARE(errors.size(), 2);
+    QVERIFY(errors.at(0).startsWith("::GetTokenInformation -> 0, last error"));
+}
+
+void TestImpersonation::tokenLogOfUnnamedGroup()
+{
+    if (!mRoot)
+        QSKIP("changing a thread's groups needs root");
+    // Only this thread gets a group without a name; the rest of the process is not touched.
+    QStringList lines;
+    std::thread worker([&lines] {
+        const gid_t groups[] = {4242421};
+        if (::syscall(SYS_setgroups, 1, groups) != 0)
+            return;
+        RkLogCapture capture;
+        ZuBase::win32TokenLog("unnamed", sProcessToken);
+        lines = dumpLines(capture);
+    });
+    worker.join();
+    QVERIFY(lines.contains(groupLine(4242421, "\\\\ERROR_NONE_MAPPED", false)));
+    gid_t own[64];
+    const int count = ::getgroups(64, own);
+    QVERIFY(count >= 0 && !std::count(own, own + count, gid_t(4242421)));
+}
+
+void TestImpersonation::adjustPrivilege()
+{
+    if (!mRoot)
+        QSKIP("capabilities to adjust are held only by root");
+    // Removing a privilege is for good, so it is done on a thread of its own.
+    RkLogCapture capture;
+    QList<bool> results;
+    QStringList after;
+    std::thread worker([&] {
+        const std::pair<const char*, bool> steps[] = {
+            {"SeRestorePrivilege", true},
+            {"cap_fowner", true}, // or a capability's own name
+            {"SeNoSuchPrivilege", true},
+            {"cap_kill", false},
+            {"cap_kill", true}};
+        for (const auto& [name, enable] : steps)
+            results << ZuBase::win32TokenAdjustPrivilege(sProcessToken, const_cast<char*>(name),
+                                                         enable)
+                           .isOk();
+        RkLogCapture dump;
+        ZuBase::win32TokenLog("after", sProcessToken);
+        after = dumpLines(dump);
+    });
+    worker.join();
+    QCOMPARE(results, QList<bool>({true, true, false, true, true}));
+    // Removed for good: enabling it again leaves it absent.
+    QCOMPARE(after.filter("cap_kill"), QStringList());
+    QVERIFY(after.contains("        SeRestorePrivilege  [0x2]"));
+    // Only a token that is no token makes the adjustment itself fail.
+    QVERIFY(ZuBase::win32TokenAdjustPrivilege(nullptr, (char*)"SeRestorePrivilege", true).isBad());
+    const QStringList errors = logLines(capture, nullptr, RkLogError);
+    QCOMPARE(errors.size(), 2);
+    QVERIFY2(errors.at(0).startsWith("::LookupPrivilegeValue SeNoSuchPrivilege -> 0, last error"),
+             qPrintable(errors.at(0)));
+    QVERIFY(
+        errors.at(1).startsWith("::AdjustTokenPrivileges SeRestorePrivilege -> 0, last error 9:"));
+
+    // The other threads keep it.
+    RkLogCapture mainDump;
+    ZuBase::win32TokenLog("main", sProcessToken);
+    QVERIFY(dumpLines(mainDump).contains("        cap_kill  [0x2]"));
+}
+
+void TestImpersonation::loginWithoutCallbackOrPassword()
+{
+    QVERIFY(!ZuBase::Win32Impersonation::login());
+
+    // An empty password means that no impersonation is wanted.
+    const QString user = sUser;
+    const QString password = sPassword;
+    sUser = "someone";
+    sPassword.clear();
+    sCallbackCalls = 0;
+    ZuBase::Win32Impersonation::setImpersonationUserCallback(&credentials);
+    QVERIFY(ZuBase::Win32Impersonation::login());
+    QCOMPARE(sCallbackCalls, 1);
+    QString outUser = "x", outPassword = "y";
+    ZuBase::Win32Impersonation::getImpersonationUser(outUser, outPassword);
+    QCOMPARE(QStringList({outUser, outPassword}), QStringList({"someone", ""}));
+    sUser = user;
+    sPassword = password;
+
+    // Without a token a scope changes nothing.
+    QTemporaryDir dir;
+    RkLogCapture capture;
+    {
+        ZuBase::Win32Impersonation scope;
+        QVERIFY(createFile(dir.filePath("plain")));
+    }
+    QCOMPARE(QFileInfo(dir.filePath("plain")).ownerId(), ::geteuid());
+    QCOMPARE(logLines(capture, "Tz"), QStringList());
+}
+
+void TestImpersonation::logonOfRealAccount()
+{
+    if (!mRoot)
+        QSKIP("creating a throwaway account and checking its password needs root");
+    if (!mAccountMade)
+        QSKIP("useradd/chpasswd could not create the throwaway account");
+
+    RkLogCapture capture;
+    QString user = sUser;
+    QString wrong = "not-" + sPassword;
+    QCOMPARE(ZuBase::Win32Impersonation::win32Login(user, wrong), nullptr);
+    QString unknown = "zutst-nobody";
+    QCOMPARE(ZuBase::Win32Impersonation::win32Login(unknown, wrong), nullptr);
+    QStringList errors = logLines(capture, nullptr, RkLogError);
+    QCOMPARE(errors.size(), 2);
+    QVERIFY2(errors.at(0).startsWith("::LogonUser " + sUser + " -> 0, last error"),
+             qPrintable(errors.at(0)));
+
+    // Every accepted form of the name logs on.
+    for (const QString& form : {sUser, ".\\" + sUser, QHostInfo::localHostName() + "\\" + sUser}) {
+        QString name = form;
+        QString password = sPassword;
+        void* token = ZuBase::Win32Impersonation::win32Login(name, password);
+        QVERIFY2(token, qPrintable(form));
+        if (form != sUser)
+            continue;
+        RkLogCapture dump;
+        ZuBase::win32TokenLog("account", token);
+        QCOMPARE(dumpLines(dump),
+                 QStringList({"<token> [account]", "    <TokenGroups>",
+                              groupLine(mGid, unixGroup(mGid), true),
+                              groupLine(::getgrnam("users")->gr_gid, "Unix Group\\\\users", false),
+                              "    </TokenGroups>", "    <TokenPrivileges>",
+                              "    </TokenPrivileges>", "</token> [account]"}));
+    }
+    // The password never reaches the log.
+    QCOMPARE(logLines(capture).filter(sPassword), QStringList());
+}
+
+void TestImpersonation::impersonationIsPerThread()
+{
+    if (!mRoot)
+        QSKIP("changing a thread's identity needs root");
+    if (!mAccountMade)
+        QSKIP("useradd/chpasswd could not create the throwaway account");
+
+    // A failed logon answers false and leaves no token, so the next login asks again.
+    const QString password = sPassword;
+    sPassword = "wrong";
+    sCallbackCalls = 0;
+    QVERIFY(!ZuBase::Win32Impersonation::login());
+    sPassword = password;
+
+    RkLogCapture capture;
+    QVERIFY(ZuBase::Win32Impersonation::login());
+    QCOMPARE(sCallbackCalls, 2);
+    QVERIFY(ZuBase::Win32Impersonation::login()); // the token is kept
+    QCOMPARE(sCallbackCalls, 2);
+
+    QTemporaryDir dir;
+    // The account must be able to create files in the folder.
+    QCOMPARE(::chmod(QFile::encodeName(dir.path()).constData(), 0777), 0);
+    QSemaphore impersonating, mainWrote;
+    long workerId = 0;
+    bool insideOk = false, afterOk = false;
+    std::thread worker([&] {
+        workerId = ::syscall(SYS_gettid);
+        {
+            ZuBase::Win32Impersonation scope;
+            impersonating.release();
+            mainWrote.acquire();
+            insideOk = createFile(dir.filePath("inside"));
+            // A copy carries the flag and reverts as well, which does no harm.
+            ZuBase::Win32Impersonation copy(scope);
+            Q_UNUSED(copy);
+        }
+        afterOk = createFile(dir.filePath("after"));
+    });
+    impersonating.acquire();
+    // Meanwhile this thread is still itself.
+    const bool mainOk = createFile(dir.filePath("main"));
+    mainWrote.release();
+    worker.join();
+
+    QVERIFY(mainOk && insideOk && afterOk);
+    const QFileInfo inside(dir.filePath("inside"));
+    QCOMPARE(QList<uint>({inside.ownerId(), inside.groupId()}), QList<uint>({mUid, mGid}));
+    QCOMPARE(QFileInfo(dir.filePath("main")).ownerId(), uint(0));
+    QCOMPARE(QFileInfo(dir.filePath("after")).ownerId(), uint(0));
+    QCOMPARE(::geteuid(), uid_t(0));
+
+    QCOMPARE(logLines(capture, "Tz", RkLogInfo),
+             QStringList({"::LogonUser " + sUser + " -> ok",
+                          QString("::ImpersonateLoggedOnUser %1 -> ok").arg(workerId),
+                          "::RevertToSelf -> ok", "::RevertToSelf -> ok"}));
+}
+
+void TestImpersonation::impersonateFailure()
+{
+    RkLogCapture capture;
+    // Handles that were never handed out are refused, not followed.
+    int notAToken = 0;
+    QVERIFY(ZuBase::Win32Impersonation::impersonate(&notAToken).isBad());
+    QVERIFY(ZuBase::win32TokenAdjustPrivilege(&notAToken, (char*)"cap_kill", false).isBad());
+    capture.clear();
+    const RkResult res = ZuBase::Win32Impersonation::impersonate(nullptr);
+    QVERIFY(res.isBad());
+    QCOMPARE(int(res.records().size()), 1);
+    QCOMPARE(int(res.records().front().code), 2);
+    QVERIFY(res.records().front().message.empty() && res.records().front().detail.empty());
+    const QStringList errors = logLines(capture, nullptr, RkLogError);
+    QCOMPARE(errors.size(), 1);
+    QVERIFY(errors.at(0).startsWith(
+        QString("::ImpersonateLoggedOnUser %1 -> 0, last error").arg(::syscall(SYS_gettid))));
+}
+
+QTEST_GUILESS_MAIN(TestImpersonation)
+#include "tst_impersonation.moc"

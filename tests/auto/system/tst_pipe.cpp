@@ -1,0 +1,359 @@
+// Named pipes: transfers between processes, the connection states, failures of a peer that goes
+// away, one instance per name, a peer that is not ours, copies and the serving thread.
+#include "TestSupport.h"
+
+#include "zubase/Pipe.h"
+#include "zubase/platform/SysPipe.h"
+
+#include <QElapsedTimer>
+#include <QProcess>
+#include <QStandardPaths>
+#include <QTemporaryDir>
+#include <QUuid>
+#include <QtTest>
+
+#include <algorithm>
+#include <memory>
+#include <thread>
+
+#include <unistd.h>
+
+using TestSupport::failureLines;
+
+namespace {
+
+const QString sPeer = TestSupport::helper("zu_pipe_peer");
+const QString sWhere = QStringLiteral("src/core/zubase/Pipe:ZuBase::Pipe::");
+
+// The bytes zu_pipe_peer sends and expects.
+QByteArray pattern(int inSize)
+{
+    QByteArray bytes(inSize, '\0');
+    for (int i = 0; i < inSize; ++i)
+        bytes[i] = static_cast<char>((i * 31 + i / 251) & 0xFF);
+    return bytes;
+}
+
+QString uniqueName()
+{
+    return QStringLiteral("zutest-") + QUuid::createUuid().toString(QUuid::WithoutBraces);
+}
+
+QString socketPath(const QString& inName)
+{
+    std::string path;
+    ZuPlatform::pipeSocketPath(("\\\\.\\pipe\\" + inName).toStdString(), path);
+    return QString::fromStdString(path);
+}
+
+// Whether inText goes from inServer to inClient unchanged.
+bool passes(ZuBase::Pipe& inServer, ZuBase::Pipe& inClient, const QByteArray& inText)
+{
+    QByteArray got(inText.size(), '\0');
+    return inServer.write(inText.constData(), unsigned(inText.size())).isOk() &&
+           inClient.read(got.data(), unsigned(got.size())).isOk() && got == inText;
+}
+
+// Both ends of one name, neither open yet.
+struct Ends
+{
+    explicit Ends(const QString& inName = uniqueName()) : name(inName)
+    {
+        server.nameSet(name);
+        client.nameSet(name);
+    }
+    QString name;
+    ZuBase::Pipe server{true};
+    ZuBase::Pipe client{false};
+};
+
+} // namespace
+
+class TestPipe : public QObject
+{
+    Q_OBJECT
+
+private slots:
+    void transferAcrossProcesses_data();
+    void transferAcrossProcesses();
+    void peerDiesMidTransfer_data();
+    void peerDiesMidTransfer();
+    void acceptStates();
+    void oneInstanceAndReadOnlyClient();
+    void privateSocketWithoutLiveServer();
+    void foreignPeerReadsStream();
+    void copiesShareOneHandle();
+    void pipeServerAcceptsAndPaces();
+};
+
+void TestPipe::transferAcrossProcesses_data()
+{
+    QTest::addColumn<bool>("serverHere");
+    QTest::addColumn<int>("size");
+    QTest::addColumn<int>("piece"); // the peer server's writes, 0: one
+    QTest::newRow("to client: 1") << true << 1 << 0;
+    QTest::newRow("to client: 100") << true << 100 << 0;
+    QTest::newRow("to client: 65537") << true << 65537 << 0;
+    QTest::newRow("to client: 3 MiB + 11") << true << 3 * 1024 * 1024 + 11 << 0;
+    QTest::newRow("from server: 100 in 60 and 40") << false << 100 << 60;
+    QTest::newRow("from server: odd size, one write") << false << 1000003 << 0;
+    QTest::newRow("from server: odd size, odd pieces") << false << 77777 << 4093;
+}
+
+void TestPipe::transferAcrossProcesses()
+{
+    QFETCH(bool, serverHere);
+    QFETCH(int, size);
+    QFETCH(int, piece);
+
+    const QString name = uniqueName();
+    QStringList args{serverHere ? "client" : "server", name, QString::number(size)};
+    if (piece)
+        args << QString::number(piece);
+    ZuBase::Pipe pipe(serverHere);
+    pipe.nameSet(name);
+    QProcess peer;
+    if (serverHere) {
+        QVERIFY(pipe.createOnServer().isOk());
+        peer.start(sPeer, args);
+        RkLogCapture capture;
+        QVERIFY(pipe.acceptOnServer().isOk());
+        QVERIFY(pipe.isConnected());
+        QCOMPARE(capture.texts(),
+                 std::vector<std::string>(
+                     {"::ConnectNamedPipe() [" + name.toStdString() + "]", "pipeConnected"}));
+        const QByteArray data = pattern(size);
+        QVERIFY(pipe.write(data.constData(), unsigned(size)).isOk());
+    } else {
+        peer.start(sPeer, args);
+        QVERIFY(pipe.connectOnClient().isOk());
+        QVERIFY(pipe.isConnected());
+        QByteArray got(size, '\0');
+        QVERIFY(pipe.read(got.data(), 0).isOk());
+        QVERIFY(pipe.read(got.data(), unsigned(size)).isOk());
+        QCOMPARE(got, pattern(size));
+        pipe.close();
+    }
+    QVERIFY(peer.waitForFinished(20000));
+    QCOMPARE(peer.exitCode(), 0); // a client peer got exactly the pattern
+}
+
+void TestPipe::peerDiesMidTransfer_data()
+{
+    QTest::addColumn<bool>("serverHere");
+    QTest::newRow("client dies while we write") << true;
+    QTest::newRow("server dies while we read") << false;
+}
+
+void TestPipe::peerDiesMidTransfer()
+{
+    QFETCH(bool, serverHere);
+
+    // The transfer ends with a record; no signal kills us, nothing hangs.
+    const QString name = uniqueName();
+    ZuBase::Pipe pipe(serverHere);
+    pipe.nameSet(name);
+    QProcess peer;
+    RkLogCapture capture;
+    if (serverHere) {
+        QVERIFY(pipe.createOnServer().isOk());
+        peer.start(sPeer, {"client-die", name, "1000"});
+        QVERIFY(pipe.acceptOnServer().isOk());
+        const QByteArray data = pattern(8 * 1024 * 1024); // far more than the socket holds
+        QVERIFY(pipe.write(data.constData(), unsigned(data.size())).isBad());
+        QCOMPARE(failureLines(capture).value(0), sWhere + "write: ::WriteFile  cond[b]");
+        QVERIFY(failureLines(capture).value(1).startsWith("last error "));
+    } else {
+        peer.start(sPeer, {"server-die", name, "1000"});
+        QVERIFY(pipe.connectOnClient().isOk());
+        QByteArray got(5000, '\0');
+        QVERIFY(pipe.read(got.data(), 5000).isBad());
+        QCOMPARE(got.left(1000), pattern(1000)); // what came before stays
+        QCOMPARE(failureLines(capture),
+                 QStringList({sWhere + "read: ::ReadFile  cond[b]", "last error 32: Broken pipe"}));
+    }
+    QVERIFY(peer.waitForFinished(5000));
+}
+
+void TestPipe::acceptStates()
+{
+    Ends ends;
+    QVERIFY(ends.server.createOnServer().isOk());
+    // No client: a bad result after the time-out, and nothing left pending.
+    RkLogCapture capture;
+    QElapsedTimer timer;
+    timer.start();
+    QVERIFY(ends.server.acceptOnServer().isBad());
+    QVERIFY(timer.elapsed() >= 900);
+    QVERIFY(!ends.server.isConnected());
+    QCOMPARE(capture.texts(),
+             std::vector<std::string>{"::ConnectNamedPipe() [" + ends.name.toStdString() + "]"});
+    // A client that connects before the next pass counts as connected.
+    QVERIFY(ends.client.connectOnClient().isOk());
+    QVERIFY(ends.server.acceptOnServer().isOk());
+    QVERIFY(ends.server.isConnected());
+    QVERIFY(passes(ends.server, ends.client, "hello"));
+    // Further passes find the client connected at once.
+    QVERIFY(ends.server.acceptOnServer().isOk());
+    // After the client has gone the pipe cannot be used again: accepting fails at once.
+    ends.client.close();
+    capture.clear();
+    timer.restart();
+    QVERIFY(ends.server.acceptOnServer().isBad());
+    QVERIFY(timer.elapsed() < 900);
+    QVERIFY(!ends.server.isConnected());
+    QVERIFY(capture.texts("Tz").empty());
+}
+
+void TestPipe::oneInstanceAndReadOnlyClient()
+{
+    Ends ends;
+    QVERIFY(ends.server.createOnServer().isOk());
+    // Creating again replaces our own server end instead of competing with it.
+    QVERIFY(ends.server.createOnServer().isOk());
+    QVERIFY(ends.client.connectOnClient().isOk());
+    QVERIFY(ends.server.acceptOnServer().isOk());
+    RkLogCapture capture;
+    // A second server and a second client are refused with a record.
+    ZuBase::Pipe secondServer(true), secondClient(false);
+    secondServer.nameSet(ends.name);
+    secondClient.nameSet(ends.name);
+    QVERIFY(secondServer.createOnServer().isBad());
+    QVERIFY(!secondServer.isCreated());
+    QVERIFY(secondClient.connectOnClient().isBad());
+    QVERIFY(!secondClient.isConnected());
+    // The client end cannot write.
+    QVERIFY(ends.client.write("abc", 3).isBad());
+    QCOMPARE(
+        failureLines(capture),
+        QStringList({sWhere + "createOnServer: ::CreateNamedPipe  val[-1]  notexp[-1]",
+                     "last error 98: Address already in use",
+                     sWhere + "connectOnClient: ::CreateFile  val[-1]  notexp[-1]",
+                     "last error 16: Device or resource busy",
+                     sWhere + "write: ::WriteFile  cond[b]", "last error 9: Bad file descriptor"}));
+    // None of that disturbs the connected pair.
+    QVERIFY(passes(ends.server, ends.client, "abc"));
+    // Once the first server has closed, the name is free again.
+    ends.server.close();
+    QVERIFY(secondServer.createOnServer().isOk());
+}
+
+void TestPipe::privateSocketWithoutLiveServer()
+{
+    // Sockets live in a directory of ours that nobody else may enter.
+    Ends ends;
+    const QFileInfo dir(QFileInfo(socketPath(ends.name)).absolutePath());
+    QVERIFY(dir.isDir());
+    QCOMPARE(dir.permissions() & (QFile::ReadGroup | QFile::WriteGroup | QFile::ExeGroup |
+                                  QFile::ReadOther | QFile::WriteOther | QFile::ExeOther),
+             QFile::Permissions());
+    QCOMPARE(dir.ownerId(), uint(geteuid()));
+    // A server that was killed leaves its socket behind.
+    QProcess crashed;
+    crashed.start(sPeer, {"server", ends.name, "10"});
+    QTRY_VERIFY(QFile::exists(socketPath(ends.name)));
+    crashed.kill();
+    QVERIFY(crashed.waitForFinished(5000));
+    QVERIFY(QFile::exists(socketPath(ends.name)));
+
+    // A client finds no pipe (after the wait for a server), rather than a busy one ...
+    RkLogCapture capture;
+    QVERIFY(ends.client.connectOnClient().isBad());
+    QVERIFY(!ends.client.isConnected());
+    QVERIFY(!ends.client.isCreated());
+    QVERIFY(capture.texts("Tz").empty());
+    // ... while a client that waits for a server gets the new one, which takes the name over
+    // and removes the socket when it closes.
+    RkResult res;
+    std::thread connecting([&] { res = ends.client.connectOnClient(); });
+    QTest::qWait(300);
+    QVERIFY(ends.server.createOnServer().isOk());
+    connecting.join();
+    QVERIFY(res.isOk());
+    QVERIFY(ends.client.isConnected());
+    QVERIFY(ends.server.acceptOnServer().isOk());
+    ends.server.close();
+    QVERIFY(!QFile::exists(socketPath(ends.name)));
+}
+
+void TestPipe::foreignPeerReadsStream()
+{
+    const QString socat = QStandardPaths::findExecutable("socat");
+    if (socat.isEmpty())
+        QSKIP("socat is not installed");
+    Ends ends;
+    QVERIFY(ends.server.createOnServer().isOk());
+    QTemporaryDir dir;
+    const QString output = dir.filePath("received");
+    QProcess reader;
+    reader.start(socat, {"-u", "UNIX-CONNECT:" + socketPath(ends.name), "CREATE:" + output});
+    QVERIFY(reader.waitForStarted());
+    QVERIFY(ends.server.acceptOnServer().isOk());
+    const QByteArray data = pattern(300007);
+    QVERIFY(ends.server.write(data.constData(), 100000).isOk());
+    QVERIFY(ends.server.write(data.constData() + 100000, 200007).isOk());
+    ends.server.close();
+    QVERIFY(reader.waitForFinished(10000));
+    QCOMPARE(reader.exitCode(), 0);
+    QFile received(output);
+    QVERIFY(received.open(QIODevice::ReadOnly));
+    QCOMPARE(received.readAll(), data);
+}
+
+void TestPipe::copiesShareOneHandle()
+{
+    Ends ends;
+    auto server = std::make_unique<ZuBase::Pipe>(true);
+    server->nameSet(ends.name);
+    QVERIFY(server->createOnServer().isOk());
+    ZuBase::Pipe copy(*server);
+    {
+        ZuBase::Pipe another(true);
+        another = copy;
+        QCOMPARE(another.name(), ends.name);
+    } // a copy going away leaves the handle open
+    server.reset();
+    QVERIFY(copy.isCreated());
+    QVERIFY(ends.client.connectOnClient().isOk());
+    QVERIFY(copy.acceptOnServer().isOk());
+    QVERIFY(passes(copy, ends.client, "ok"));
+
+    // close() on one copy closes the shared handle for all of them; again it is harmless.
+    ZuBase::Pipe third(copy);
+    third.close();
+    QVERIFY(!copy.isCreated());
+    QVERIFY(!third.isConnected());
+    RkLogCapture capture;
+    copy.close();
+    QVERIFY(capture.entries().empty());
+    QVERIFY(copy.read(nullptr, 0).isOk()); // no transfer, no check
+}
+
+void TestPipe::pipeServerAcceptsAndPaces()
+{
+    Ends ends;
+    RkLogCapture capture;
+    {
+        ZuBase::PipeServer serving;
+        QVERIFY(serving.pipeSet(ends.server).isOk());
+        QVERIFY(ends.server.isCreated());
+        QVERIFY(ends.client.connectOnClient().isOk());
+        QTRY_VERIFY(ends.server.isConnected());
+        QVERIFY(passes(ends.server, ends.client, pattern(4099)));
+        // While the client stays, the serving thread does not spin.
+        QTest::qWait(1200);
+        const auto texts = capture.texts();
+        QVERIFY(std::count(texts.begin(), texts.end(), "pipeConnected") <= 3);
+    } // the destructor stops the thread
+    QVERIFY(ends.server.isCreated());
+
+    // A pipe that cannot be created starts no thread.
+    ZuBase::Pipe taken(true);
+    taken.nameSet(ends.name);
+    ZuBase::PipeServer refused;
+    QVERIFY(refused.pipeSet(taken).isBad());
+    QVERIFY(!refused.isRunning());
+}
+
+QTEST_GUILESS_MAIN(TestPipe)
+#include "tst_pipe.moc"
