@@ -7,16 +7,31 @@ template <typename T> RkHandle<ZuBase::Command> make()
     return new T;
 }
 
+const struct
+{
+    const char* name;
+    ZuBase::Command::Factory factory;
+} kCommands[] = {{"help", &make<HelpCommand>},
+                 {"screenshot", &make<ScreenshotCommand>},
+                 {"quit", &make<QuitCommand>},
+                 {"scheme", &make<SchemeCommand>}};
+
 } // namespace
 
 namespace DemoCommands {
 
 void registerAll()
 {
-    ZuBase::Command::registerFactory(QStringLiteral("help"), &make<HelpCommand>);
-    ZuBase::Command::registerFactory(QStringLiteral("screenshot"), &make<ScreenshotCommand>);
-    ZuBase::Command::registerFactory(QStringLiteral("quit"), &make<QuitCommand>);
-    ZuBase::Command::registerFactory(QStringLiteral("scheme"), &make<SchemeCommand>);
+    for (const auto& command : kCommands)
+        ZuBase::Command::registerFactory(QLatin1String(command.name), command.factory);
+}
+
+QStringList names()
+{
+    QStringList result;
+    for (const auto& command : kCommands)
+        result << QLatin1String(command.name);
+    return result;
 }
 
 } // namespace DemoCommands

@@ -8,6 +8,8 @@ namespace DemoCommands {
 
 // Registers the commands with ZuBase::Command.
 void registerAll();
+// The names registered, in the order of the usage text.
+QStringList names();
 
 } // namespace DemoCommands
 
