@@ -17,7 +17,7 @@ if [ "${1:-}" = "--sanitize" ]; then
     # must see from the start.
     crypt="$(ldconfig -p | awk '/libcrypt\.so\.1 .*x86-64/ {print $NF; exit}')"
     export LD_PRELOAD="${crypt:+$crypt}"
-    export ASAN_OPTIONS="detect_leaks=0:abort_on_error=1:detect_stack_use_after_return=1"
+    export ASAN_OPTIONS="detect_leaks=0:abort_on_error=1:detect_stack_use_after_return=1:verify_asan_link_order=0"
     export UBSAN_OPTIONS="print_stacktrace=1:halt_on_error=1"
 else
     build="${ZUBASE_BUILD_DIR:-$root/build}"
