@@ -4,6 +4,8 @@
 # reached in the build tree through forwarding headers under ${ZUBASE_INCLUDE_DIR}/zubase/ and
 # installed flat, so hosts write #include <zubase/X.h> whatever the family folder.
 #
+# A family whose lists are still empty adds nothing.
+#
 # zubase_add_family(<family>
 #     QT <Qt modules, e.g. Core Xml>
 #     PUBLIC_HEADERS <headers installed as <zubase/X.h>>
@@ -11,6 +13,9 @@
 #     [LIBS <further private libraries>])
 function(zubase_add_family family)
     cmake_parse_arguments(F "" "" "QT;PUBLIC_HEADERS;SOURCES;LIBS" ${ARGN})
+    if(NOT F_PUBLIC_HEADERS AND NOT F_SOURCES)
+        return() # a family folder waiting for its first class
+    endif()
     set(target zubase_${family})
     add_library(${target} OBJECT ${F_PUBLIC_HEADERS} ${F_SOURCES})
     # Every family builds part of libzubase: the export macro must mark its API for export.

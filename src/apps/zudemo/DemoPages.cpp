@@ -3,6 +3,14 @@
 #include "DemoCommands.h"
 #include "DemoDialogsPage.h"
 #include "DemoSchemePage.h"
+// Widgets I
+
+// Widgets II
+
+// Widgets III
+
+// Widgets IV
+
 
 #include <QLabel>
 #include <QPlainTextEdit>
@@ -41,6 +49,14 @@ const std::vector<DemoPage>& demoPages()
         {"scheme", "Colour schemes", &make<DemoSchemePage>},
         {"dialogs", "Dialogs", &make<DemoDialogsPage>},
         {"commands", "Commands", &createCommandsPage},
+        // Widgets I
+
+        // Widgets II
+
+        // Widgets III
+
+        // Widgets IV
+
     };
     return pages;
 }
