@@ -108,14 +108,11 @@ const char* parseParameter(const std::string& inLine, std::string& outName, std:
         pos = close + 1;
     } else {
         const std::size_t start = pos;
-        while (pos < inLine.size() && !isBlank(inLine[pos]) && inLine[pos] != '"' &&
-               inLine[pos] != '#')
+        while (pos < inLine.size() && !isBlank(inLine[pos]) && inLine[pos] != '"')
             ++pos;
         outValue = inLine.substr(start, pos - start);
     }
-    if (pos < inLine.size() && !isBlank(inLine[pos]) && inLine[pos] != '#')
-        return "unexpected text after the value";
-    if (!restIsEmpty(inLine, pos))
+    if ((pos < inLine.size() && !isBlank(inLine[pos])) || !restIsEmpty(inLine, pos))
         return "unexpected text after the value";
     return nullptr;
 }

@@ -15,9 +15,9 @@
 //
 //     # comment lines and blank lines may stand anywhere
 //     Name {                      the block opens with "{", optionally behind a name
-//         Name value              a bare value: printable characters without blanks, '"', '#'
+//         Name value              a bare value: no blanks, no '"', not starting with '#'
 //         Name "quoted value"     a quoted value: any text without '"' (no escapes)
-//         Name "value"  # note    a comment may follow the value
+//         Name "value"  # note    a comment may follow the value, after a blank
 //     }                           the block ends with a line that is only "}"
 //
 // A name starts with a letter or '_' and goes on with letters, digits, '_', '.' and '-'; names

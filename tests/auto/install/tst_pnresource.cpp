@@ -79,6 +79,7 @@ private slots:
     void unexpectedFormatIsLeftAlone_data();
     void unexpectedFormatIsLeftAlone();
     void fullDiskKeepsRegistry();
+    void unstorableFolderIsSkipped();
     void userFolders();
 
 private:
@@ -434,6 +435,8 @@ void TestPnResource::unexpectedFormatIsLeftAlone_data()
     QTest::newRow("comment after the block") << QByteArray("R {\n OtherVersion1 /gone\n}\n# end\n");
     QTest::newRow("truncated since reading") << QByteArray("R {\n OtherVersion1 /gone\n");
     QTest::newRow("only the brace") << QByteArray("OtherVersion1 /gone\n}\n\n");
+    QTest::newRow("block named like an entry")
+        << QByteArray("OtherVersionBlock {\n A 1\n OtherVersion1 /gone\n}\n");
 }
 
 void TestPnResource::unexpectedFormatIsLeftAlone()
@@ -474,6 +477,31 @@ void TestPnResource::fullDiskKeepsRegistry()
     QCOMPARE(child.readAllStandardOutput(), "4.1 " + t + "/a\n4.2 " + t + "/b\n4.3 " + t + "/c\n");
     QCOMPARE(readFile(registry()), content);
     QCOMPARE(QDir(mRoot + "/share/dicom").entryList(QDir::Files), QStringList{"PernelRegistry"});
+}
+
+void TestPnResource::unstorableFolderIsSkipped()
+{
+    // Not from a file (the reader refuses a double quote inside a quoted value), but a bundle
+    // handed over by a host may hold one.
+    install("quo\"te", "0", "");
+    install("fine", "0", "");
+    startWith("");
+    DvParamBundle bundle;
+    for (const char* name : {"quo\"te", "fine"})
+        bundle.add(std::make_unique<DvParameter>(
+            "OtherVersion", RkString(QFile::encodeName("4." + QString::number(bundle.size()) + " " +
+                                                       mBase + "/" + name)
+                                         .toStdString())));
+    PnResource::readFromBundle(bundle);
+    RkLogCapture capture;
+    std::map<RkVersion, std::string> found;
+    PnResource::getOtherVersions(found, RkVersion("8.0"));
+    QCOMPARE(logLines(capture, nullptr, RkLogWarning),
+             QStringList("Other version folder " + mBase +
+                         "/quo\"te cannot be stored in PernelRegistry, ignoring."));
+    QCOMPARE(found.size(), std::size_t(1));
+    QCOMPARE(readFile(registry()), registryHead(mRoot) + "    OtherVersion1 \"4.1 " +
+                                       QFile::encodeName(mBase) + "/fine\" # \n}\n");
 }
 
 void TestPnResource::userFolders()

@@ -147,12 +147,6 @@ void rewriteOtherVersionLines(const std::vector<Entry>& inEntries)
     }
     while (!lines.isEmpty() && lines.last().trimmed().isEmpty())
         lines.removeLast();
-    if (lines.size() < 2 || lines.last().simplified() != "}") {
-        announce();
-        log.warnf("PernelRegistry has unexpected format, can't update.");
-        return;
-    }
-
     QByteArray content;
     for (int i = 0; i + 1 < lines.size(); ++i)
         content += lines[i] + '\n';
@@ -161,6 +155,15 @@ void rewriteOtherVersionLines(const std::vector<Entry>& inEntries)
         content += "    OtherVersion" + QByteArray::number(++number) + ' ' +
                    QByteArray::fromStdString(entry.text) + '\n';
     content += "}\n";
+    // Never write what the reader would refuse (say, a block opened by a line that starts
+    // with "OtherVersion").
+    if (lines.size() < 2 || lines.last().simplified() != "}" ||
+        !VelmarMesh::parse(content.toStdString(), pathText.c_str(), nullptr)) {
+        announce();
+        log.warnf("PernelRegistry has unexpected format, can't update.");
+        return;
+    }
+
     // The bundle in memory still holds the old entries after an update; a second call must not
     // pile up backups of an unchanged file.
     if (content == old)
