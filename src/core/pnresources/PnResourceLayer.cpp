@@ -24,7 +24,6 @@ struct LayerState
     std::string userName;
     bool userNameKnown = false;
     std::string localDirectory;
-    bool localDirectoryExplicit = false;
     std::string volumeDirectory;
     RkString startupDirectory;
 };
@@ -43,7 +42,7 @@ bool isDirectory(const std::string& inPath)
 
 bool isTrue(const std::string& inText)
 {
-    return inText == "1" || inText == "true" || inText == "yes";
+    return inText == "1" || inText == "true";
 }
 
 } // namespace
@@ -97,26 +96,20 @@ void readFromBundle(const DvParamBundle& inBundle)
                 std::make_unique<DvParameter>(parameter->getName(), parameter->getString()));
     }
     s.bundle.clear();
-    bool volumeGiven = false;
     for (auto& entry : copies) {
         const auto& parameter = static_cast<const DvParameter&>(*entry);
         const std::string& name = parameter.getName().str();
         const std::string& value = parameter.getString().str();
-        if (name == "LocalDirectory") {
+        if (name == "LocalDirectory")
             s.localDirectory = value;
-            s.localDirectoryExplicit = true;
-            if (!volumeGiven)
-                s.volumeDirectory = value;
-        } else if (name == "VolumeDirectory") {
+        else if (name == "VolumeDirectory")
             s.volumeDirectory = value;
-            volumeGiven = true;
-        } else if (name == "WebServiceEnabled") {
+        else if (name == "WebServiceEnabled")
             s.webServiceEnabled = isTrue(value);
-        } else if (name == "WebServiceHost") {
+        else if (name == "WebServiceHost")
             s.webServiceHost = value;
-        } else if (name == "WebServiceLoginName") {
+        else if (name == "WebServiceLoginName")
             s.webServiceLoginName = value;
-        }
         s.bundle.add(std::move(entry));
     }
 }
@@ -170,17 +163,11 @@ const char* getUserName()
 void setLocalDirectoryNonExplicit(const char* inPath)
 {
     state().localDirectory = inPath ? inPath : "";
-    state().localDirectoryExplicit = false;
 }
 
 const char* getLocalDirectory()
 {
     return state().localDirectory.c_str();
-}
-
-bool isLocalDirectoryExplicit()
-{
-    return state().localDirectoryExplicit;
 }
 
 void setVolumeDirectory(const char* inPath)

@@ -23,9 +23,9 @@ PNRESOURCES_EXPORT void registryFilePathSet(const char* inPath);
 // The parameters of the last registry taken over with readFromBundle().
 PNRESOURCES_EXPORT DvParamBundle& registryBundle();
 // Takes over a freshly read registry: copies its text parameters into registryBundle() and
-// applies the settings it names (case-sensitive): LocalDirectory, VolumeDirectory (defaults to
-// LocalDirectory when only that is given), WebServiceEnabled ("1"/"true"/"yes" switch it on,
-// anything else off), WebServiceHost, WebServiceLoginName.
+// applies the settings it names (case-sensitive): LocalDirectory, VolumeDirectory,
+// WebServiceEnabled ("1" or "true" switch it on, anything else off), WebServiceHost,
+// WebServiceLoginName.
 PNRESOURCES_EXPORT void readFromBundle(const DvParamBundle& inBundle);
 // Empties registryBundle(); the settings stay as they are.
 PNRESOURCES_EXPORT void clearRegistryBundle();
@@ -41,11 +41,9 @@ PNRESOURCES_EXPORT const char* getUserName();
 
 // Folder name of the local directory below the root when the registry names none.
 PNRESOURCES_EXPORT extern const char* const defaultLocalDirName;
-// Sets the local directory as a default: isLocalDirectoryExplicit() is false afterwards.
+// Sets the local directory as a default; a LocalDirectory of the registry replaces it.
 PNRESOURCES_EXPORT void setLocalDirectoryNonExplicit(const char* inPath);
 PNRESOURCES_EXPORT const char* getLocalDirectory();
-// True when the local directory came from the registry.
-PNRESOURCES_EXPORT bool isLocalDirectoryExplicit();
 PNRESOURCES_EXPORT void setVolumeDirectory(const char* inPath);
 PNRESOURCES_EXPORT const char* getVolumeDirectory();
 // Bad, with one record per folder, when the local or the volume directory is no directory.
