@@ -106,6 +106,9 @@ void TestLanguageSelector::setAndStore()
     QCOMPARE(selector.language(), "en");
     selector.setLanguage("de");
     QCOMPARE(selector.currentText(), "Deutsch");
+    selector.setLanguage("en");
+    QCOMPARE(selector.currentIndex(), 0);
+    selector.setLanguage("de");
     QCOMPARE(PnLanguageSelector::loadFromRegistry(), QString()); // choosing is not storing
 
     PnLanguageSelector::saveToRegistry(selector.language());

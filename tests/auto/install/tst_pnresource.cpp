@@ -223,7 +223,7 @@ void TestPnResource::registryFallback_data()
     QTest::addColumn<QByteArray>("content"); // "-": no file
     QTest::addColumn<QString>("logged");     // after the read line; $P: the registry
     // clang-format off
-    QTest::newRow("readable") << QByteArray("R {\n WebServiceEnabled true\n WebServiceHost h\n LocalDirectory \"$R/l\"\n"
+    QTest::newRow("readable") << QByteArray("R {\n WebServiceEnabled 1\n WebServiceHost h\n LocalDirectory \"$R/l\"\n"
                                             " VolumeDirectory \"$R/v\"\n}\n") << "";
     QTest::newRow("no volume directory") << QByteArray("R {\n VolumeDirectory \"$R/none\"\n}\n")
         << "src/core/pnresources/PnResourceLayer:PnResource::checkDirectories: Volume directory $R/none not found."
@@ -253,7 +253,7 @@ void TestPnResource::registryFallback()
     if (!read)
         expected << "Couldn't read registry file $P.\nUsing default settings.";
     QCOMPARE(logLines(capture), expand(expected.join('|')).replace("$P", registry()).split('|'));
-    QCOMPARE(PnResource::isWebServiceEnabled(), content.contains("true"));
+    QCOMPARE(PnResource::isWebServiceEnabled(), content.contains("Enabled 1"));
     QCOMPARE(PnResource::getWebServiceHost(), content.contains("Host h") ? "h" : "localhost");
     QCOMPARE(PnResource::getWebServiceLoginName(), getpwuid(geteuid())->pw_name);
     QCOMPARE(QFile::decodeName(PnResource::getLocalDirectory()),
