@@ -114,12 +114,10 @@ void rewriteOtherVersionLines(const std::vector<Entry>& inEntries)
     RkLogFile& log = getTheLogInstance();
     const std::string& pathText = PnResource::registryFilePath().str();
     const QString path = decode(pathText);
-    // Said once, before the first thing that happens; an update that changes nothing is quiet.
-    bool announced = false;
+    // Said before the first thing that happens (once on every way through); an update that
+    // changes nothing is quiet.
     const auto announce = [&]() {
-        if (!announced)
-            log.printf("Updating OtherVersion info in PernelRegistry.");
-        announced = true;
+        log.printf("Updating OtherVersion info in PernelRegistry.");
     };
 
     QFile file(path);
