@@ -75,7 +75,7 @@ class TestPnResource : public QObject
     QByteArray local(const QString& inText) const { return QFile::encodeName(expand(inText)); }
     // "folder|candidate|output": an installation with the fake server in candidate folder 0, 1
     // or 2 ("-": none; a trailing "h": it hangs after printing). Returns the server's path.
-    QString install(const QString& inSpec);
+    QString install(const QString& inInstallation);
     // The registry: a comment, the block, LocalDirectory, the given lines.
     void start(const QByteArray& inLines);
 
@@ -101,9 +101,9 @@ private slots:
     void shellExtensions();
 };
 
-QString TestPnResource::install(const QString& inSpec)
+QString TestPnResource::install(const QString& inInstallation)
 {
-    const QStringList parts = inSpec.split('|');
+    const QStringList parts = inInstallation.split('|');
     QDir().mkpath(mBase + "/" + parts[0]);
     if (parts[1] == "-")
         return QString();
@@ -334,8 +334,8 @@ void TestPnResource::update()
     QFETCH(QStringList, logged);
     QFETCH(QStringList, lines);
     QStringList servers;
-    for (const QString& spec : installations)
-        servers << install(spec);
+    for (const QString& installation : installations)
+        servers << install(installation);
     QByteArray registryLines;
     for (int i = 0; i < entries.size(); ++i)
         registryLines +=
