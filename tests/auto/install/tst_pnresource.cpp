@@ -196,6 +196,7 @@ void TestPnResource::startUp_data()
     QTest::newRow("program folder") << "/bin/arch-Win" << "-" << "-" << false << "$R/share/dicom/PernelRegistry";
     QTest::newRow("client") << "" << "-" << "s/tzclient/R" << true << "$R/s/tzserver/R";
     QTest::newRow("no client") << "" << "-" << "s/tzclient/R" << false << "$R/s/tzclient/R";
+    QTest::newRow("empty environment") << "" << "" << "-" << false << "$R/share/dicom/PernelRegistry";
     QTest::newRow("environment") << "/bin/arch-Win" << "c/R" << "o/R" << false << "$R/c/R";
     QTest::newRow("absolute environment") << "" << "$R/tzclient/R" << "-" << true << "$R/tzclient/R";
     QTest::newRow("absolute argument") << "" << "-" << "/etc/tzclient/R" << true << "/etc/tzclient/R";

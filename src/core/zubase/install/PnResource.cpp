@@ -269,6 +269,7 @@ void initialize(const char* const inApplicationFolder, const char* const inRegis
 {
     updateFolders(inApplicationFolder);
 
+    // An empty variable counts as unset: it would name the root folder itself.
     const char* fromEnvironment = std::getenv("PERNEL_REGISTRY");
     RkFilename path(fromEnvironment && *fromEnvironment ? fromEnvironment
                     : inRegistryFile                    ? inRegistryFile
