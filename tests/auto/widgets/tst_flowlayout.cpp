@@ -82,13 +82,18 @@ public:
     QSize sizeHint() const override { return QSize(50, 20); }
 };
 
+Rects itemRects(const ZuFlowLayout& inLayout)
+{
+    Rects rects;
+    for (int i = 0; i < inLayout.count(); ++i)
+        rects << inLayout.itemAt(i)->geometry();
+    return rects;
+}
+
 Rects layOut(ZuFlowLayout& ioLayout, int inWidth)
 {
     ioLayout.setGeometry(QRect(0, 0, inWidth, 500));
-    Rects rects;
-    for (int i = 0; i < ioLayout.count(); ++i)
-        rects << ioLayout.itemAt(i)->geometry();
-    return rects;
+    return itemRects(ioLayout);
 }
 
 } // namespace
@@ -165,8 +170,11 @@ void tst_FlowLayout::rows()
     ZuFlowLayout layout(margin, spacingH, spacingV);
     for (const QSize& size : sizes)
         layout.addItem(new Item(size));
-    QCOMPARE(layout.heightForWidth(width), height);
     QCOMPARE(layOut(layout, width), expected);
+    QCOMPARE(layout.geometry(), QRect(0, 0, width, 500));
+    QCOMPARE(layout.heightForWidth(width), height);
+    layout.heightForWidth(40); // measuring moves nothing
+    QCOMPARE(itemRects(layout), expected);
     QVERIFY(layout.hasHeightForWidth());
     QCOMPARE(layout.expandingDirections(), Qt::Orientations());
 }
