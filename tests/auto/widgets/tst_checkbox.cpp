@@ -22,21 +22,26 @@ void tst_CheckBox::clickOnLabel_data()
     QTest::addColumn<int>("button");
     QTest::addColumn<QPoint>("releaseAt"); // from the label's centre
 
-    QTest::newRow("left") << int(Qt::LeftButton) << QPoint();
-    QTest::newRow("right") << int(Qt::RightButton) << QPoint();
-    QTest::newRow("released outside") << int(Qt::LeftButton) << QPoint(-300, 80);
+    QTest::addColumn<bool>("enabled"); // the inner box
+
+    QTest::newRow("left") << int(Qt::LeftButton) << QPoint() << true;
+    QTest::newRow("right") << int(Qt::RightButton) << QPoint() << true;
+    QTest::newRow("released outside") << int(Qt::LeftButton) << QPoint(-300, 80) << true;
+    QTest::newRow("box disabled") << int(Qt::LeftButton) << QPoint() << false;
 }
 
 void tst_CheckBox::clickOnLabel()
 {
     QFETCH(int, button);
     QFETCH(QPoint, releaseAt);
+    QFETCH(bool, enabled);
 
     ZuCheckBox widget(QStringLiteral("Show annotations"), nullptr);
     widget.show();
     QVERIFY(QTest::qWaitForWindowExposed(&widget));
     QCheckBox* box = widget.checkBox();
     QLabel* label = widget.label();
+    box->setEnabled(enabled);
     QStringList events;
     connect(box, &QCheckBox::pressed, this, [&] { events << "pressed"; });
     connect(box, &QCheckBox::released, this, [&] { events << "released"; });
@@ -46,13 +51,14 @@ void tst_CheckBox::clickOnLabel()
     for (const bool on : {true, false}) {
         QTest::mousePress(label, Qt::MouseButton(button), {}, label->rect().center());
         QVERIFY(box->isDown()); // drawn pressed until the release
-        QCOMPARE(box->isChecked(), !on);
+        QCOMPARE(box->isChecked(), enabled && !on);
         QTest::mouseRelease(label, Qt::MouseButton(button), {}, label->rect().center() + releaseAt);
         QVERIFY(!box->isDown());
-        QCOMPARE(box->isChecked(), on);
+        QCOMPARE(box->isChecked(), enabled && on);
     }
-    QCOMPARE(events, QStringList({"pressed", "on", "released", "clicked", "pressed", "off",
-                                  "released", "clicked"}));
+    QCOMPARE(events, enabled ? QStringList({"pressed", "on", "released", "clicked", "pressed",
+                                            "off", "released", "clicked"})
+                             : QStringList());
 }
 
 void tst_CheckBox::accessibleNameAndSize_data()
@@ -84,12 +90,19 @@ void tst_CheckBox::accessibleNameAndSize()
     QCOMPARE(widget.minimumSizeHint(),
              QSize(boxMin.width() + labelMin.width(), qMax(boxMin.height(), labelMin.height())));
 
-    // A new text is read once it is shown; a name the caller gave the box stays.
+    // A new text is read when it is painted or the box gets the focus; a name the caller gave
+    // the box stays.
     widget.show();
+    QVERIFY(QTest::qWaitForWindowExposed(&widget));
     widget.label()->setText(QStringLiteral("Second"));
-    QTRY_COMPARE(box->accessibleName(), QStringLiteral("Second"));
-    box->setAccessibleName(QStringLiteral("Mine"));
+    widget.label()->repaint();
+    QCOMPARE(box->accessibleName(), QStringLiteral("Second"));
     widget.label()->setText(QStringLiteral("Third"));
+    QFocusEvent focusIn(QEvent::FocusIn);
+    QApplication::sendEvent(box, &focusIn);
+    QCOMPARE(box->accessibleName(), QStringLiteral("Third"));
+    box->setAccessibleName(QStringLiteral("Mine"));
+    widget.label()->setText(QStringLiteral("Fourth"));
     widget.label()->repaint();
     QCOMPARE(box->accessibleName(), QStringLiteral("Mine"));
 }

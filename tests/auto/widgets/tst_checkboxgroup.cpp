@@ -175,14 +175,14 @@ void tst_CheckBoxGroup::duplicatesAndRemoval()
 
 void tst_CheckBoxGroup::destroyedChildLeaves()
 {
-    Panel panel({true, false, false});
-    delete panel.children[0].data();
+    Panel panel({true, true, false});
+    delete panel.children[2].data();
     QVERIFY(!panel.parent->isTristate()); // the two left agree
-    QCOMPARE(panel.parent->checkState(), Qt::Unchecked);
-    panel.children[1]->setChecked(true);
+    QCOMPARE(panel.parent->checkState(), Qt::Checked);
+    panel.children[1]->setChecked(false);
     for (int i = 0; i < 3; ++i)
         panel.click(panel.parent);
-    QCOMPARE(panel.states(), States({false, true, false}));
+    QCOMPARE(panel.states(), States({true, false, false}));
 }
 
 void tst_CheckBoxGroup::restoreWhileSlotRemovesChild()

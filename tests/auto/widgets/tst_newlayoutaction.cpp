@@ -79,6 +79,13 @@ void tst_NewLayoutAction::pointing()
     QCOMPARE(cell(column, row), highlight);
     QVERIFY(layout.width() > 9 || cell(column + 1, row) != highlight);
     QVERIFY(layout.height() > 4 || cell(column, row + 1) != highlight);
+    // An unselected cell is outlined in the text colour, all four edges.
+    const QColor ink = grid->palette().color(QPalette::WindowText);
+    const QPoint last(2 + 34 * 9, header + 2 + 34 * 4);
+    if (layout.width() < 10) {
+        for (const QPoint& edge : {QPoint(15, 0), QPoint(29, 15), QPoint(15, 29), QPoint(0, 15)})
+            QCOMPARE(image.pixelColor(last + edge), ink);
+    }
 }
 
 void tst_NewLayoutAction::keysInMenu()

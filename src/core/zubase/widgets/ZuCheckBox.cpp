@@ -12,8 +12,7 @@ class CheckBoxLabel : public QLabel
 public:
     CheckBoxLabel(const QString& inText, QCheckBox* inCheckBox, QWidget* inParent)
         : QLabel(inText, inParent), mCheckBox(inCheckBox)
-    {
-    }
+    {}
     ~CheckBoxLabel() override = default;
 
 protected:
@@ -82,8 +81,7 @@ bool ZuCheckBox::Private::eventFilter(QObject* inWatched, QEvent* inEvent)
     return false;
 }
 
-ZuCheckBox::ZuCheckBox(const QString& inText, QWidget* inParent)
-    : QWidget(inParent), d(new Private)
+ZuCheckBox::ZuCheckBox(const QString& inText, QWidget* inParent) : QWidget(inParent), d(new Private)
 {
     setSizePolicy(QSizePolicy::Expanding, QSizePolicy::MinimumExpanding);
     auto* layout = new QHBoxLayout(this);

@@ -42,8 +42,10 @@ public:
 void ZuCollapsibleWidget::Private::updateAccessibleName()
 {
     const QString title = titleLabel->text();
-    const QString name = (expanded ? ZuCollapsibleWidget::tr("Collapse %1")
-                                           : ZuCollapsibleWidget::tr("Expand %1")).arg(title).trimmed();
+    const QString name =
+        (expanded ? ZuCollapsibleWidget::tr("Collapse %1") : ZuCollapsibleWidget::tr("Expand %1"))
+            .arg(title)
+            .trimmed();
     if (expanderButton->accessibleName() != name)
         expanderButton->setAccessibleName(name);
 }
@@ -140,9 +142,9 @@ ZuCollapsibleWidget::ZuCollapsibleWidget(const QString& inTitle, QWidget* inPare
     d->updateAccessibleName();
 }
 
-ZuCollapsibleWidget::ZuCollapsibleWidget(QWidget* inParent) : ZuCollapsibleWidget(QString(), inParent)
-{
-}
+ZuCollapsibleWidget::ZuCollapsibleWidget(QWidget* inParent)
+    : ZuCollapsibleWidget(QString(), inParent)
+{}
 
 ZuCollapsibleWidget::~ZuCollapsibleWidget() = default;
 

@@ -2,6 +2,7 @@
 
 #include <QApplication>
 #include <QList>
+#include <QVector>
 #include <QWidget>
 
 class ZuFlowLayout::Private
@@ -9,12 +10,29 @@ class ZuFlowLayout::Private
 public:
     Private(int inHorizontalSpacing, int inVerticalSpacing)
         : horizontalSpacing(inHorizontalSpacing), verticalSpacing(inVerticalSpacing)
+    {}
+
+    // What one item needs: its size hint and the room before its neighbours.
+    struct Measure
     {
+        QSize hint;
+        int spaceX;
+        int spaceY;
+    };
+
+    void forget()
+    {
+        measured = false;
+        cachedWidth = -1;
     }
 
     QList<QLayoutItem*> items; // owned
     int horizontalSpacing;
     int verticalSpacing;
+    // The items are measured once per invalidation, as QWidgetItemV2 does, so that the passes
+    // at other widths run over this array instead of every widget's own data.
+    QVector<Measure> measures;
+    bool measured = false;
     // Widgets ask again and again for the height at the width they already have.
     int cachedWidth = -1;
     int cachedHeight = 0;
@@ -42,7 +60,7 @@ ZuFlowLayout::~ZuFlowLayout()
 void ZuFlowLayout::addItem(QLayoutItem* inItem)
 {
     d->items.append(inItem);
-    d->cachedWidth = -1;
+    d->forget();
 }
 
 QLayoutItem* ZuFlowLayout::itemAt(int inIndex) const
@@ -54,7 +72,7 @@ QLayoutItem* ZuFlowLayout::takeAt(int inIndex)
 {
     if (inIndex < 0 || inIndex >= d->items.size())
         return nullptr;
-    d->cachedWidth = -1;
+    d->forget();
     return d->items.takeAt(inIndex);
 }
 
@@ -121,7 +139,7 @@ void ZuFlowLayout::setGeometry(const QRect& inRect)
 
 void ZuFlowLayout::invalidate()
 {
-    d->cachedWidth = -1;
+    d->forget();
     QLayout::invalidate();
 }
 
@@ -137,35 +155,46 @@ int ZuFlowLayout::doLayout(const QRect& inRect, bool inTrialOnly) const
     int y = effectiveRect.y();
     int lineHeight = 0;
 
-    const int horizontal = horizontalSpacing();
-    const int vertical = verticalSpacing();
-    // Spacers and nested layouts have no widget to ask for the style's spacing.
-    const QWidget* parent = parentWidget();
-    const QStyle* fallbackStyle = parent ? parent->style() : QApplication::style();
+    if (!d->measured) {
+        const int horizontal = horizontalSpacing();
+        const int vertical = verticalSpacing();
+        // Spacers and nested layouts have no widget to ask for the style's spacing.
+        const QWidget* parent = parentWidget();
+        const QStyle* fallbackStyle = parent ? parent->style() : QApplication::style();
+        d->measures.resize(d->items.size());
+        for (int i = 0; i < d->items.size(); ++i) {
+            QLayoutItem* item = d->items.at(i);
+            Private::Measure& measure = d->measures[i];
+            measure.hint = item->sizeHint();
+            measure.spaceX = horizontal;
+            measure.spaceY = vertical;
+            if (horizontal != -1 && vertical != -1)
+                continue;
+            const QWidget* widget = item->widget();
+            const QStyle* style = widget ? widget->style() : fallbackStyle;
+            if (horizontal == -1)
+                measure.spaceX = style->layoutSpacing(QSizePolicy::PushButton,
+                                                      QSizePolicy::PushButton, Qt::Horizontal);
+            if (vertical == -1)
+                measure.spaceY = style->layoutSpacing(QSizePolicy::PushButton,
+                                                      QSizePolicy::PushButton, Qt::Vertical);
+        }
+        d->measured = true;
+    }
 
-    for (QLayoutItem* item : qAsConst(d->items)) {
-        const QWidget* widget = item->widget();
-        const QStyle* style = widget ? widget->style() : fallbackStyle;
-        int spaceX = horizontal;
-        if (spaceX == -1)
-            spaceX = style->layoutSpacing(QSizePolicy::PushButton, QSizePolicy::PushButton,
-                                          Qt::Horizontal);
-        int spaceY = vertical;
-        if (spaceY == -1)
-            spaceY = style->layoutSpacing(QSizePolicy::PushButton, QSizePolicy::PushButton,
-                                          Qt::Vertical);
-        const QSize hint = item->sizeHint();
-        int nextX = x + hint.width() + spaceX;
-        if (nextX - spaceX > effectiveRect.right() && lineHeight > 0) {
+    for (int i = 0; i < d->measures.size(); ++i) {
+        const Private::Measure& measure = d->measures.at(i);
+        int nextX = x + measure.hint.width() + measure.spaceX;
+        if (nextX - measure.spaceX > effectiveRect.right() && lineHeight > 0) {
             x = effectiveRect.x();
-            y = y + lineHeight + spaceY;
-            nextX = x + hint.width() + spaceX;
+            y = y + lineHeight + measure.spaceY;
+            nextX = x + measure.hint.width() + measure.spaceX;
             lineHeight = 0;
         }
         if (!inTrialOnly)
-            item->setGeometry(QRect(QPoint(x, y), hint));
+            d->items.at(i)->setGeometry(QRect(QPoint(x, y), measure.hint));
         x = nextX;
-        lineHeight = qMax(lineHeight, hint.height());
+        lineHeight = qMax(lineHeight, measure.hint.height());
     }
     return y + lineHeight - inRect.y() + bottom;
 }

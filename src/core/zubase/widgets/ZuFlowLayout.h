@@ -37,14 +37,15 @@ public:
     // The layout never asks for more room than its size hint.
     Qt::Orientations expandingDirections() const override;
     bool hasHeightForWidth() const override;
-    // The height the items take at that width, margins included. Answered from a cache while
-    // the width and the items stay the same; invalidate() empties it.
+    // The height the items take at that width, margins included. The items are measured once
+    // per invalidation and the last answer is kept for the same width; invalidate(), addItem()
+    // and takeAt() forget both.
     int heightForWidth(int inWidth) const override;
     // The largest item's minimum size plus the margins (not a row).
     QSize minimumSize() const override;
     QSize sizeHint() const override;
     void setGeometry(const QRect& inRect) override;
-    // Forgets the cached heights along with QLayout's own caches.
+    // Forgets the measured items and the cached height along with QLayout's own caches.
     void invalidate() override;
 
 private:

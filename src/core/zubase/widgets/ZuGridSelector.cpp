@@ -69,7 +69,8 @@ ZuGridSelector::ZuGridSelector(QWidget* inParent, int inStep)
 
 QString ZuGridSelector::caption() const
 {
-    return tr("New Layout") + QStringLiteral(" %1x%2").arg(mSelectedColumn + 1).arg(mSelectedRow + 1);
+    return tr("New Layout") +
+           QStringLiteral(" %1x%2").arg(mSelectedColumn + 1).arg(mSelectedRow + 1);
 }
 
 void ZuGridSelector::selectionChanged()

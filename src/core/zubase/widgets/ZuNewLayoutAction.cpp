@@ -5,7 +5,7 @@
 ZuNewLayoutAction::ZuNewLayoutAction(QWidget* inParent, int inColumnStep) : QWidgetAction(inParent)
 {
     auto* grid = new ZuGridSelector(inParent, inColumnStep);
-    connect(grid, SIGNAL(cellSelected(int, int)), this, SLOT(gridSelected(int, int)));
+    connect(grid, &ZuGridSelector::cellSelected, this, &ZuNewLayoutAction::gridSelected);
     setDefaultWidget(grid);
 }
 
