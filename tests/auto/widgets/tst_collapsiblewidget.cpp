@@ -211,6 +211,8 @@ void tst_CollapsibleWidget::contentAndHeaderWidgets()
     QVERIFY(header->isVisible() && x(header) > x(text));
     delete header;
     QVERIFY(!widget.headerWidget());
+    widget.setExpanded(false); // the content area folds away whatever its content's minimum
+    QTRY_COMPARE(content->parentWidget()->height(), 0);
 }
 
 QTEST_MAIN(tst_CollapsibleWidget)

@@ -103,24 +103,27 @@ void tst_FlowLayout::rows()
 void tst_FlowLayout::spacingFallbacks_data()
 {
     QTest::addColumn<QString>("setup");
-    QTest::addColumn<int>("spacing"); // given to the constructor, both ways
+    QTest::addColumn<QPoint>("given"); // to the constructor, across and down
     QTest::addColumn<QPoint>("spacings");
     QTest::addColumn<QPoint>("used"); // before the second item and before the second row
 
     // The parent's style says 7/9 as metric (or -1 when bare) and 3/4 per control, the item
     // widgets' own style 5/6, the application style 8/11, a parent box layout 4.
-    QTest::newRow("parent's metric") << "parent" << -1 << QPoint(7, 9) << QPoint(7, 9);
-    QTest::newRow("widgets' style") << "bare, widgets" << -1 << QPoint(-1, -1) << QPoint(5, 6);
-    QTest::newRow("spacers: parent's style") << "bare" << -1 << QPoint(-1, -1) << QPoint(3, 4);
-    QTest::newRow("in a box layout") << "box" << -1 << QPoint(4, 4) << QPoint(4, 4);
-    QTest::newRow("no parent: application") << "none" << -1 << QPoint(-1, -1) << QPoint(8, 11);
-    QTest::newRow("zero: items touch") << "parent" << 0 << QPoint(0, 0) << QPoint(0, 0);
+    const QPoint derived(-1, -1);
+    QTest::newRow("parent's metric") << "parent" << derived << QPoint(7, 9) << QPoint(7, 9);
+    QTest::newRow("widgets' style") << "bare, widgets" << derived << derived << QPoint(5, 6);
+    QTest::newRow("widgets' style across")
+        << "bare, widgets" << QPoint(-1, 2) << QPoint(-1, 2) << QPoint(5, 2);
+    QTest::newRow("spacers: parent's style") << "bare" << derived << derived << QPoint(3, 4);
+    QTest::newRow("in a box layout") << "box" << derived << QPoint(4, 4) << QPoint(4, 4);
+    QTest::newRow("no parent: application") << "none" << derived << derived << QPoint(8, 11);
+    QTest::newRow("zero: items touch") << "parent" << QPoint() << QPoint() << QPoint();
 }
 
 void tst_FlowLayout::spacingFallbacks()
 {
     QFETCH(QString, setup);
-    QFETCH(int, spacing);
+    QFETCH(QPoint, given);
     QFETCH(QPoint, spacings);
     QFETCH(QPoint, used);
 
@@ -129,8 +132,8 @@ void tst_FlowLayout::spacingFallbacks()
     QWidget parent;
     parent.setStyle(setup.startsWith(QLatin1String("bare")) ? &bare : &parentStyle);
     const bool nested = setup == QLatin1String("box") || setup == QLatin1String("none");
-    auto* layout = nested ? new ZuFlowLayout(0, spacing, spacing)
-                          : new ZuFlowLayout(&parent, 0, spacing, spacing);
+    auto* layout = nested ? new ZuFlowLayout(0, given.x(), given.y())
+                          : new ZuFlowLayout(&parent, 0, given.x(), given.y());
     std::unique_ptr<ZuFlowLayout> unparented(setup == QLatin1String("none") ? layout : nullptr);
     if (setup == QLatin1String("box")) {
         auto* box = new QVBoxLayout(&parent);
