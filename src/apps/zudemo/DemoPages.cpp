@@ -4,6 +4,7 @@
 #include "DemoDialogsPage.h"
 #include "DemoSchemePage.h"
 // Widgets I
+#include "DemoWidgetsPanelsPage.h"
 
 // Widgets II
 
@@ -50,6 +51,7 @@ const std::vector<DemoPage>& demoPages()
         {"dialogs", "Dialogs", &make<DemoDialogsPage>},
         {"commands", "Commands", &createCommandsPage},
         // Widgets I
+        {"widgets-panels", "Panels", &make<DemoWidgetsPanelsPage>},
 
         // Widgets II
 
