@@ -8,7 +8,9 @@ class ZuCheckBoxGroup::Private
 {
 public:
     QPointer<QCheckBox> parentCheckBox;
-    QList<QPointer<QCheckBox>> children; // in the order added, duplicates kept
+    // Held as plain objects: a child announcing its destruction is no longer a QCheckBox,
+    // so it must be found without casting.
+    QList<QPointer<QObject>> children; // in the order added, duplicates kept
     QList<bool> recordedStates;          // index for index with the children
     bool updating = false;               // the group itself is changing check states
 
@@ -16,13 +18,18 @@ public:
     void dropChild(QObject* inDestroyed)
     {
         for (int i = children.size() - 1; i >= 0; --i) {
-            QCheckBox* child = children.at(i).data();
-            if (child && static_cast<QObject*>(child) != inDestroyed)
+            const QObject* child = children.at(i).data();
+            if (child && child != inDestroyed)
                 continue;
             children.removeAt(i);
             if (i < recordedStates.size())
                 recordedStates.removeAt(i);
         }
+    }
+
+    static QCheckBox* box(const QPointer<QObject>& inChild)
+    {
+        return static_cast<QCheckBox*>(inChild.data());
     }
 };
 
@@ -52,7 +59,7 @@ void ZuCheckBoxGroup::removeCheckBox(QCheckBox* inCheckBox)
     if (!inCheckBox)
         return;
     disconnect(inCheckBox, nullptr, this, nullptr);
-    d->children.removeAll(inCheckBox);
+    d->children.removeAll(QPointer<QObject>(inCheckBox));
     updateParentCheckBoxState();
 }
 
@@ -71,10 +78,10 @@ void ZuCheckBoxGroup::setParentCheckBox(QCheckBox* inCheckBox)
 void ZuCheckBoxGroup::setCheckedAll(bool inChecked)
 {
     d->updating = true;
-    const QList<QPointer<QCheckBox>> children = d->children; // slots may change the list
-    for (const QPointer<QCheckBox>& child : children) {
-        if (child)
-            child->setChecked(inChecked);
+    const QList<QPointer<QObject>> children = d->children; // slots may change the list
+    for (const QPointer<QObject>& child : children) {
+        if (QCheckBox* box = Private::box(child))
+            box->setChecked(inChecked);
     }
     d->updating = false;
     if (!d->children.isEmpty())
@@ -103,15 +110,15 @@ void ZuCheckBoxGroup::slot_parentCheckBoxStateChanged()
     d->updating = true;
     if (state != Qt::PartiallyChecked) {
         const bool checked = d->parentCheckBox->isChecked();
-        const QList<QPointer<QCheckBox>> children = d->children; // slots may change the list
-        for (const QPointer<QCheckBox>& child : children) {
-            if (child)
-                child->setChecked(checked);
+        const QList<QPointer<QObject>> children = d->children; // slots may change the list
+        for (const QPointer<QObject>& child : children) {
+            if (QCheckBox* box = Private::box(child))
+                box->setChecked(checked);
         }
     } else {
         // A slot may take children away meanwhile: never index past either list.
         for (int i = 0; i < d->recordedStates.size() && i < d->children.size(); ++i) {
-            if (QCheckBox* child = d->children.at(i))
+            if (QCheckBox* child = Private::box(d->children.at(i)))
                 child->setChecked(d->recordedStates.at(i));
         }
     }
@@ -124,8 +131,9 @@ void ZuCheckBoxGroup::updateParentCheckBoxState()
         return;
     d->recordedStates.clear();
     int checkedCount = 0;
-    for (const QPointer<QCheckBox>& child : qAsConst(d->children)) {
-        const bool checked = child && child->isChecked();
+    for (const QPointer<QObject>& child : qAsConst(d->children)) {
+        const QCheckBox* box = Private::box(child);
+        const bool checked = box && box->isChecked();
         d->recordedStates.append(checked);
         if (checked)
             ++checkedCount;
