@@ -3,6 +3,8 @@
 #include "zubase/platform/SysProcess.h"
 
 #include "zubase/platform/HandleTable.h"
+#include "zubase/platform/UniqueFd.h"
+#include "zubase/platform/WinCommandLine.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -247,75 +249,6 @@ int readError(int inPipe)
 
 } // namespace
 
-std::vector<std::string> splitCommandLine(const std::string& inCommandLine)
-{
-    std::vector<std::string> args;
-    const char* p = inCommandLine.c_str();
-    const auto blank = [](char c) {
-        return c == ' ' || c == '\t';
-    };
-
-    // The program name: quotes toggle, backslashes are plain characters.
-    std::string program;
-    bool inQuotes = false;
-    while (*p && (inQuotes || !blank(*p))) {
-        if (*p == '"')
-            inQuotes = !inQuotes;
-        else
-            program += *p;
-        ++p;
-    }
-    if (program.empty() && p == inCommandLine.c_str())
-        return args;
-    args.push_back(program);
-
-    for (;;) {
-        while (blank(*p))
-            ++p;
-        if (!*p)
-            break;
-        std::string arg;
-        inQuotes = false;
-        for (;;) {
-            bool copy = true;
-            std::size_t backslashes = 0;
-            while (*p == '\\') {
-                ++p;
-                ++backslashes;
-            }
-            if (*p == '"') {
-                if (backslashes % 2 == 0) {
-                    if (inQuotes && p[1] == '"')
-                        ++p; // "" inside quotes is one literal quote
-                    else {
-                        copy = false;
-                        inQuotes = !inQuotes;
-                    }
-                }
-                backslashes /= 2;
-            }
-            arg.append(backslashes, '\\');
-            if (!*p || (!inQuotes && blank(*p)))
-                break;
-            if (copy)
-                arg += *p;
-            ++p;
-        }
-        args.push_back(arg);
-    }
-    return args;
-}
-
-std::vector<std::string> environmentEntries(const char* inBlock)
-{
-    std::vector<std::string> entries;
-    if (!inBlock)
-        return entries;
-    for (const char* p = inBlock; *p; p += std::strlen(p) + 1)
-        entries.emplace_back(p);
-    return entries;
-}
-
 int createProcessSuspended(const std::string& inCommandLine, const char* inEnvironmentBlock,
                            const std::string& inWorkingDirectory, ProcessCreation& outCreation)
 {
@@ -348,41 +281,34 @@ int createProcessSuspended(const std::string& inCommandLine, const char* inEnvir
     std::vector<char*> envp = pointers(envTexts);
     const char* dir = inWorkingDirectory.empty() ? nullptr : inWorkingDirectory.c_str();
 
-    const int devNull = open("/dev/null", O_RDWR | O_CLOEXEC);
-    if (devNull < 0)
+    const UniqueFd devNull(open("/dev/null", O_RDWR | O_CLOEXEC));
+    if (!devNull.isOpen())
         return errno;
     int errorPipe[2];
-    if (pipe2(errorPipe, O_CLOEXEC) != 0) {
-        const int error = errno;
-        close(devNull);
-        return error;
-    }
+    if (pipe2(errorPipe, O_CLOEXEC) != 0)
+        return errno;
+    const UniqueFd errorReader(errorPipe[0]);
+    UniqueFd errorWriter(errorPipe[1]);
 
     const pid_t pid = fork();
-    if (pid < 0) {
-        const int error = errno;
-        close(devNull);
-        close(errorPipe[0]);
-        close(errorPipe[1]);
-        return error;
-    }
+    if (pid < 0)
+        return errno;
     if (pid == 0) {
         resetSignals();
         setsid(); // no terminal of ours: a detached process
-        dup2(devNull, 0);
-        dup2(devNull, 1);
-        dup2(devNull, 2);
+        dup2(devNull.get(), 0);
+        dup2(devNull.get(), 1);
+        dup2(devNull.get(), 2);
         if (dir && chdir(dir) != 0)
-            writeErrorAndExit(errorPipe[1], errno);
-        closeDescriptorsFrom(3, errorPipe[1]);
+            writeErrorAndExit(errorWriter.get(), errno);
+        closeDescriptorsFrom(3, errorWriter.get());
         // Suspended: nothing of the program runs before the parent continues us.
         kill(getpid(), SIGSTOP);
         execve(program.c_str(), argv.data(), inEnvironmentBlock ? envp.data() : environ);
-        writeErrorAndExit(errorPipe[1], errno);
+        writeErrorAndExit(errorWriter.get(), errno);
     }
 
-    close(devNull);
-    close(errorPipe[1]);
+    errorWriter.reset();
     int status = 0;
     pid_t got;
     do {
@@ -392,16 +318,13 @@ int createProcessSuspended(const std::string& inCommandLine, const char* inEnvir
         // Its stop cannot be seen (the host collects children itself): do not leave it.
         const int error = errno;
         kill(pid, SIGKILL);
-        close(errorPipe[0]);
         return error;
     }
     if (!WIFSTOPPED(status)) {
         // It ended before the stop; the pipe tells why.
-        const int error = readError(errorPipe[0]);
-        close(errorPipe[0]);
+        const int error = readError(errorReader.get());
         return error ? error : ECHILD;
     }
-    close(errorPipe[0]);
 
     std::shared_ptr<Child> child = adoptChild(pid, true);
     HandleEntry entry;
@@ -411,7 +334,6 @@ int createProcessSuspended(const std::string& inCommandLine, const char* inEnvir
     entry.thread = true;
     outCreation.thread = handles().add(entry);
     outCreation.processId = static_cast<unsigned>(pid);
-    outCreation.threadId = static_cast<unsigned>(pid);
     return 0;
 }
 
@@ -433,7 +355,7 @@ int resumeThread(Handle inThread, int& outPreviousCount)
 
 int openProcess(unsigned inProcessId, bool inFullAccess, Handle& outProcess)
 {
-    outProcess = 0;
+    outProcess = kNullHandle;
     const pid_t pid = static_cast<pid_t>(inProcessId);
     if (pid <= 0)
         return EINVAL;
@@ -449,10 +371,8 @@ int openProcess(unsigned inProcessId, bool inFullAccess, Handle& outProcess)
                 return errno == EPERM ? EACCES : errno;
         } else {
             // Reading the mappings needs the same right as reading the modules later.
-            const int fd = open(procPath(pid, "maps").c_str(), O_RDONLY | O_CLOEXEC);
-            if (fd < 0)
+            if (!UniqueFd(open(procPath(pid, "maps").c_str(), O_RDONLY | O_CLOEXEC)).isOpen())
                 return errno;
-            close(fd);
         }
     }
     outProcess = handles().add(entry);
@@ -467,7 +387,7 @@ int exitCodeProcess(Handle inProcess, int& outExitCode)
     if (entry.child) {
         std::lock_guard<std::mutex> lock(entry.child->mutex);
         if (!entry.child->ended) {
-            outExitCode = StillActive;
+            outExitCode = kStillActive;
             return 0;
         }
         if (entry.child->lost)
@@ -480,7 +400,7 @@ int exitCodeProcess(Handle inProcess, int& outExitCode)
     if (!statFields(entry.pid, fields))
         return ESRCH;
     if (fields[0] != "Z" && fields[0] != "X") {
-        outExitCode = StillActive;
+        outExitCode = kStillActive;
         return 0;
     }
     // Field 52 of the stat line: the status the parent will collect.
@@ -600,24 +520,20 @@ int shellExecuteElevated(const std::string& inFile, const std::vector<std::strin
     int errorPipe[2];
     if (pipe2(errorPipe, O_CLOEXEC) != 0)
         return errno;
+    const UniqueFd errorReader(errorPipe[0]);
+    UniqueFd errorWriter(errorPipe[1]);
     const pid_t pid = fork();
-    if (pid < 0) {
-        const int error = errno;
-        close(errorPipe[0]);
-        close(errorPipe[1]);
-        return error;
-    }
+    if (pid < 0)
+        return errno;
     if (pid == 0) {
         resetSignals();
-        closeDescriptorsFrom(3, errorPipe[1]);
+        closeDescriptorsFrom(3, errorWriter.get());
         execv(tool.c_str(), argv.data());
-        writeErrorAndExit(errorPipe[1], errno);
+        writeErrorAndExit(errorWriter.get(), errno);
     }
-    close(errorPipe[1]);
+    errorWriter.reset();
     // The pipe closes when the tool has been loaded, or carries the error of the attempt.
-    const int error = readError(errorPipe[0]);
-    close(errorPipe[0]);
-    if (error) {
+    if (const int error = readError(errorReader.get())) {
         int status;
         while (waitpid(pid, &status, 0) < 0 && errno == EINTR) {
         }

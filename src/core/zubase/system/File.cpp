@@ -2,8 +2,9 @@
 
 #include "zubase/Impersonation.h"
 #include "zubase/ZuCheck_p.h"
-#include "zubase/platform/SysFiles.h"
 #include "zubase/platform/ReparseBuffer.h"
+#include "zubase/platform/SysFiles.h"
+#include "zubase/platform/SysTypes.h"
 
 #include <QDir>
 #include <QFile>
@@ -38,14 +39,12 @@ void traceRemoval(const char* inFormat, const QString& inPath, bool inGone)
                                Q2M(inPath).constData(), inGone ? "ok" : "fail");
 }
 
-void* const sCurrentProcessToken = reinterpret_cast<void*>(static_cast<intptr_t>(-1));
-
 // Opens a directory's reparse point, with the restore privilege raised first as writing or
 // reading one may need it.
 int openMountPoint(const std::string& inPath, ZuPlatform::ReparseHandle& outHandle)
 {
-    ZuBase::win32TokenAdjustPrivilege(sCurrentProcessToken, const_cast<char*>("SeRestorePrivilege"),
-                                      true);
+    ZuBase::win32TokenAdjustPrivilege(ZuPlatform::kCurrentProcessToken,
+                                      const_cast<char*>("SeRestorePrivilege"), true);
     return ZuPlatform::filesOpenReparsePoint(inPath, outHandle);
 }
 

@@ -1,8 +1,9 @@
 #include "zubase/Impersonation.h"
 
-#include "zubase/system/Impersonation_p.h"
 #include "zubase/ZuCheck_p.h"
 #include "zubase/platform/SysAccounts.h"
+#include "zubase/platform/SysTypes.h"
+#include "zubase/system/Impersonation_p.h"
 
 #include <QByteArray>
 #include <QHostInfo>
@@ -13,8 +14,6 @@
 #include <vector>
 
 namespace {
-
-void* const sInvalidHandle = reinterpret_cast<void*>(static_cast<intptr_t>(-1));
 
 QString& pamServiceSetting()
 {
@@ -274,7 +273,7 @@ RkResult Win32Impersonation::impersonate(void* inToken)
 {
     RkResult res;
     int error = 0;
-    if (inToken == sInvalidHandle) {
+    if (inToken == ZuPlatform::kCurrentProcessToken) {
         // The process's own token: the thread takes the identity it has anyway.
         ZuPlatform::AccountToken* own = nullptr;
         error = ZuPlatform::accountsOpenProcessToken(own);
@@ -343,11 +342,11 @@ RkResult win32TokenAdjustPrivilege(void* const inToken, char* const inPrivilegeN
     RkResult res;
     ZuPlatform::AccountToken* token = accountToken(inToken);
     bool opened = false;
-    if (inToken == sInvalidHandle) {
+    if (inToken == ZuPlatform::kCurrentProcessToken) {
         token = nullptr;
         const int error = ZuPlatform::accountsOpenProcessToken(token);
         if (Tz::logWinFunc(error == 0 ? 1 : 0, 1, "::OpenProcessToken", nullptr, false, error) ||
-            static_cast<void*>(token) == sInvalidHandle || !token) {
+            static_cast<void*>(token) == ZuPlatform::kCurrentProcessToken || !token) {
             res.makeBad(1);
             return res;
         }
@@ -378,7 +377,7 @@ void win32TokenLog(QString inTitle, void* const inToken)
     log.printf("<token> [%s]", title.constData());
     void* token = inToken;
     bool opened = false;
-    if (inToken == sInvalidHandle) {
+    if (inToken == ZuPlatform::kCurrentProcessToken) {
         ZuPlatform::AccountToken* processToken = nullptr;
         const int error = ZuPlatform::accountsOpenProcessToken(processToken);
         if (Tz::logWinFunc(error == 0 ? 1 : 0, 1, "::OpenProcessToken", nullptr, false, error)) {

@@ -27,13 +27,13 @@ struct Pipe::SharedHandle
 {
     ~SharedHandle()
     {
-        const std::intptr_t handle = value.exchange(InvalidHandle);
-        if (handle != InvalidHandle) {
+        const std::intptr_t handle = value.exchange(ZuPlatform::kInvalidHandle);
+        if (handle != ZuPlatform::kInvalidHandle) {
             ZuPlatform::flushPipe(handle);
             ZuPlatform::closePipe(handle);
         }
     }
-    std::atomic<std::intptr_t> value{InvalidHandle};
+    std::atomic<std::intptr_t> value{ZuPlatform::kInvalidHandle};
 };
 
 Pipe::Pipe(bool inIsServer) : mServer(inIsServer), mHandle(std::make_shared<SharedHandle>()) {}
@@ -81,17 +81,17 @@ QString Pipe::name() const
 
 bool Pipe::isCreated() const
 {
-    return handle() != InvalidHandle;
+    return handle() != ZuPlatform::kInvalidHandle;
 }
 
 RkResult Pipe::createOnServer()
 {
     RkResult res;
     close(); // a handle of an earlier creation would otherwise leak and block the name
-    ZuPlatform::PipeHandle created = ZuPlatform::InvalidPipe;
+    ZuPlatform::PipeHandle created = ZuPlatform::kInvalidHandle;
     const int error = ZuPlatform::createNamedPipe(systemName(mName), created);
     setHandle(created);
-    if (Tz::failWin(RK_CHECK_NE(handle(), InvalidHandle, "::CreateNamedPipe"), error))
+    if (Tz::failWin(RK_CHECK_NE(handle(), ZuPlatform::kInvalidHandle, "::CreateNamedPipe"), error))
         res.makeBad(1);
     return res;
 }
@@ -116,13 +116,14 @@ RkResult Pipe::connectOnClient()
     close(); // as for createOnServer: an earlier handle would leak
     const std::string name = systemName(mName);
     ZuPlatform::waitNamedPipe(name, sConnectTimeout); // only gives the server time to appear
-    ZuPlatform::PipeHandle opened = ZuPlatform::InvalidPipe;
+    ZuPlatform::PipeHandle opened = ZuPlatform::kInvalidHandle;
     const int error = ZuPlatform::openNamedPipeForReading(name, opened);
     setHandle(opened);
-    if (handle() == InvalidHandle) {
+    if (handle() == ZuPlatform::kInvalidHandle) {
         if (error == ENOENT)
             res.makeBad(1);
-        else if (Tz::failWin(RK_CHECK_NE(handle(), InvalidHandle, "::CreateFile"), error))
+        else if (Tz::failWin(RK_CHECK_NE(handle(), ZuPlatform::kInvalidHandle, "::CreateFile"),
+                             error))
             res.makeBad(1);
     }
     mConnected = res.isOk();
@@ -168,8 +169,8 @@ RkResult Pipe::write(const void* inBuffer, unsigned int inSize)
 
 void Pipe::close()
 {
-    const std::intptr_t closing = mHandle->value.exchange(InvalidHandle);
-    if (closing != InvalidHandle) {
+    const std::intptr_t closing = mHandle->value.exchange(ZuPlatform::kInvalidHandle);
+    if (closing != ZuPlatform::kInvalidHandle) {
         ZuPlatform::flushPipe(closing);
         ZuPlatform::closePipe(closing);
     }

@@ -1,8 +1,9 @@
 #include "zubase/Process.h"
 
-#include "zubase/system/Process_p.h"
 #include "zubase/ZuCheck_p.h"
 #include "zubase/platform/SysProcess.h"
+#include "zubase/platform/WinCommandLine.h"
+#include "zubase/system/Process_p.h"
 
 #include "rklib/RkDbC.h"
 #include "rklib/RkThread.h"
@@ -58,8 +59,6 @@ QByteArray environmentBlock(const QStringList& inEnvironment)
 
 namespace {
 
-constexpr std::uint32_t sStartupInformationSize = 68;
-const char* const sDesktop = "winsta0\\default";
 const int sPollInterval = 100;
 const unsigned long sWaitInterval = 10;
 const std::intptr_t sFakeElevatedProcessId = 4711;
@@ -94,10 +93,10 @@ struct ProcessHandle
 {
     ~ProcessHandle()
     {
-        if (value != 0)
+        if (value != ZuPlatform::kNullHandle)
             ZuPlatform::closeHandle(value);
     }
-    ZuPlatform::Handle value = 0;
+    ZuPlatform::Handle value = ZuPlatform::kNullHandle;
 };
 
 // A process that cannot be opened gives a bad result without a record.
@@ -121,8 +120,8 @@ RkResult Process::start(bool inElevate, bool inInheritEnvironment, bool)
 {
     RkResult res;
     mExitCode = -1;
-    mProcessInformation = ProcessInformation();
-    mStartupInformation = StartupInformation();
+    mProcessHandle = ZuPlatform::kNullHandle;
+    mThreadHandle = ZuPlatform::kNullHandle;
     mTerminatedEmitted = false;
     mPlaceholderId = false;
 
@@ -150,10 +149,6 @@ RkResult Process::start(bool inElevate, bool inInheritEnvironment, bool)
         closeHandles();
         return res;
     }
-
-    mStartupInformation.size = sStartupInformationSize;
-    mStartupInformation.desktop = sDesktop;
-    mStartupInformation.flags = 0;
 
     if (inElevate) {
         const std::vector<std::string> file = ZuPlatform::splitCommandLine(quotedExe.toStdString());
@@ -183,10 +178,8 @@ RkResult Process::start(bool inElevate, bool inInheritEnvironment, bool)
         closeHandles();
         return res;
     }
-    mProcessInformation.process = creation.process;
-    mProcessInformation.thread = creation.thread;
-    mProcessInformation.processId = creation.processId;
-    mProcessInformation.threadId = creation.threadId;
+    mProcessHandle = creation.process;
+    mThreadHandle = creation.thread;
 
     log.printf("CreateProcess(): success pid[%d]", static_cast<int>(creation.processId));
     mProcessId = creation.processId;
@@ -197,7 +190,7 @@ RkResult Process::start(bool inElevate, bool inInheritEnvironment, bool)
 void Process::resume()
 {
     int previousCount = 0;
-    ZuPlatform::resumeThread(mProcessInformation.thread, previousCount);
+    ZuPlatform::resumeThread(mThreadHandle, previousCount);
 }
 
 int Process::wait()
@@ -212,7 +205,7 @@ bool Process::isRunning()
 {
     if (mProcessId == 0)
         return false;
-    ZuPlatform::Handle process = 0;
+    ZuPlatform::Handle process = ZuPlatform::kNullHandle;
     if (openWatched(true, process) != 0)
         return false;
     bool running = false;
@@ -220,7 +213,7 @@ bool Process::isRunning()
     const int error = ZuPlatform::exitCodeProcess(process, code);
     if (error != 0)
         Tz::failWin(RK_CHECK(false, "false", "::GetExitCodeProcess"), error);
-    else if (code == ZuPlatform::StillActive)
+    else if (code == ZuPlatform::kStillActive)
         running = true;
     else
         mExitCode = code;
@@ -254,9 +247,10 @@ RkResult Process::terminate(int inExitCode)
         res.makeBad(1);
         return res;
     }
-    ZuPlatform::Handle hProcess = 0;
+    ZuPlatform::Handle hProcess = ZuPlatform::kNullHandle;
     int error = openWatched(true, hProcess);
-    if (Tz::failWin(RK_CHECK(hProcess != 0, "hProcess!=0", "::OpenProcess"), error)) {
+    if (Tz::failWin(RK_CHECK(hProcess != ZuPlatform::kNullHandle, "hProcess!=0", "::OpenProcess"),
+                    error)) {
         res.makeBad(1);
         return res;
     }
@@ -273,7 +267,7 @@ int Process::openWatched(bool inFullAccess, std::intptr_t& outHandle) const
     // The id left by an elevated start names no process here (on Windows it cannot be a
     // process id at all); a process that happens to have it must not be touched.
     if (mPlaceholderId) {
-        outHandle = 0;
+        outHandle = ZuPlatform::kNullHandle;
         return ESRCH;
     }
     return ZuPlatform::openProcess(mProcessId, inFullAccess, outHandle);
@@ -287,13 +281,10 @@ void Process::detach()
 void Process::closeHandles()
 {
     // Reset afterwards, so that a second detach() closes nothing.
-    if (mProcessInformation.process != InvalidHandle) {
-        ZuPlatform::closeHandle(mProcessInformation.process);
-        mProcessInformation.process = 0;
-    }
-    if (mProcessInformation.thread != InvalidHandle) {
-        ZuPlatform::closeHandle(mProcessInformation.thread);
-        mProcessInformation.thread = 0;
+    for (std::intptr_t* handle : {&mProcessHandle, &mThreadHandle}) {
+        if (*handle != ZuPlatform::kNullHandle)
+            ZuPlatform::closeHandle(*handle);
+        *handle = ZuPlatform::kNullHandle;
     }
 }
 
