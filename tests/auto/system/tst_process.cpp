@@ -288,6 +288,7 @@ void TestProcess::suspendedThenEnds_data()
     QTest::newRow("exits 255") << 255 << false << true;
     QTest::newRow("terminated running") << 7 << true << true;
     QTest::newRow("terminated still suspended") << 1234 << true << false;
+    QTest::newRow("terminated with the still-running code") << 259 << true << true;
 }
 
 void TestProcess::suspendedThenEnds()

@@ -37,6 +37,9 @@ int resumeThread(Handle inThread, int& outPreviousCount);
 int openProcess(unsigned inProcessId, bool inFullAccess, Handle& outProcess);
 // kStillActive while the process runs, else its exit code.
 int exitCodeProcess(Handle inProcess, int& outExitCode);
+// Whether the process has ended (WaitForSingleObject without waiting): a process may end with
+// the code kStillActive itself.
+int processEnded(Handle inProcess, bool& outEnded);
 // Kills the process; a child of ours then reports inExitCode as its exit code.
 int terminateProcess(Handle inProcess, int inExitCode);
 int closeHandle(Handle inHandle);

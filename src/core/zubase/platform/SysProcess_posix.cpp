@@ -408,6 +408,22 @@ int exitCodeProcess(Handle inProcess, int& outExitCode)
     return 0;
 }
 
+int processEnded(Handle inProcess, bool& outEnded)
+{
+    outEnded = false;
+    HandleEntry entry;
+    if (!handles().find(inProcess, entry) || entry.thread)
+        return EBADF;
+    if (entry.child) {
+        std::lock_guard<std::mutex> lock(entry.child->mutex);
+        outEnded = entry.child->ended;
+        return 0;
+    }
+    std::vector<std::string> fields;
+    outEnded = !statFields(entry.pid, fields) || fields[0] == "Z" || fields[0] == "X";
+    return 0;
+}
+
 int terminateProcess(Handle inProcess, int inExitCode)
 {
     HandleEntry entry;

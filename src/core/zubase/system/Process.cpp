@@ -99,6 +99,14 @@ struct ProcessHandle
     ZuPlatform::Handle value = ZuPlatform::kNullHandle;
 };
 
+// The exit code kStillActive is also the code of a child terminated with it: only the
+// process's own state tells whether it still runs.
+bool hasEnded(ZuPlatform::Handle inProcess)
+{
+    bool ended = false;
+    return ZuPlatform::processEnded(inProcess, ended) == 0 && ended;
+}
+
 // A process that cannot be opened gives a bad result without a record.
 RkResult openResult(int inError)
 {
@@ -213,7 +221,7 @@ bool Process::isRunning()
     const int error = ZuPlatform::exitCodeProcess(process, code);
     if (error != 0)
         Tz::failWin(RK_CHECK(false, "false", "::GetExitCodeProcess"), error);
-    else if (code == ZuPlatform::kStillActive)
+    else if (code == ZuPlatform::kStillActive && !hasEnded(process))
         running = true;
     else
         mExitCode = code;
