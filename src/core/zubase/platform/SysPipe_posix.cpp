@@ -215,8 +215,10 @@ int createNamedPipe(const std::string& inSystemName, PipeHandle& outPipe)
         return errno;
     object->listenFd = fd; // closed with the object
     const sockaddr_un address = addressOf(object->socketPath);
+    // A backlog of 0 queues exactly one connection: the one instance. A second client that
+    // comes before the accept finds the queue full and is told that the pipe is busy.
     if (bind(fd, reinterpret_cast<const sockaddr*>(&address), sizeof address) != 0 ||
-        listen(fd, 1) != 0) {
+        listen(fd, 0) != 0) {
         const int error = errno;
         unlink(object->socketPath.c_str());
         unlink(object->lockPath.c_str());
