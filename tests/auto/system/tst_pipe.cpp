@@ -5,6 +5,7 @@
 #include "zubase/Pipe.h"
 #include "zubase/platform/SysPipe.h"
 
+#include <QCryptographicHash>
 #include <QElapsedTimer>
 #include <QProcess>
 #include <QStandardPaths>
@@ -81,6 +82,8 @@ private slots:
     void acceptStates();
     void oneInstanceAndReadOnlyClient();
     void privateSocketWithoutLiveServer();
+    void socketNames_data();
+    void socketNames();
     void foreignPeerReadsStream();
     void copiesShareOneHandle();
     void pipeServerAcceptsAndPaces();
@@ -279,6 +282,37 @@ void TestPipe::privateSocketWithoutLiveServer()
     QVERIFY(ends.server.acceptOnServer().isOk());
     ends.server.close();
     QVERIFY(!QFile::exists(socketPath(ends.name)));
+}
+
+void TestPipe::socketNames_data()
+{
+    QTest::addColumn<QString>("name");
+    QTest::addColumn<QString>("file");
+    const QString run = uniqueName();
+    const QString longName = run + QString(240, 'y');
+    const QByteArray digest =
+        QCryptographicHash::hash(longName.toLocal8Bit(), QCryptographicHash::Sha256)
+            .toHex()
+            .left(32);
+    QTest::newRow("plain") << run + "Plain_1.x" << run + "Plain_1.x.pipe";
+    QTest::newRow("escaped") << run + QString::fromUtf8(" a/b\\~\u00fc")
+                             << run + "%20a%2Fb%5C%7E%C3%BC.pipe";
+    QTest::newRow("too long for a socket path")
+        << longName << "~" + QString::fromLatin1(digest) + ".pipe";
+}
+
+void TestPipe::socketNames()
+{
+    QFETCH(QString, name);
+    QFETCH(QString, file);
+    QCOMPARE(QFileInfo(socketPath(name)).fileName(), file);
+    // Usable, and apart from a name that differs only at its end.
+    Ends ends(name), other(name + "2");
+    QVERIFY(ends.server.createOnServer().isOk());
+    QVERIFY(other.server.createOnServer().isOk());
+    QVERIFY(ends.client.connectOnClient().isOk());
+    QVERIFY(ends.server.acceptOnServer().isOk());
+    QVERIFY(passes(ends.server, ends.client, "x"));
 }
 
 void TestPipe::foreignPeerReadsStream()

@@ -14,6 +14,8 @@ namespace ZuPlatform {
 using PipeHandle = Handle;
 
 // The socket file of a system pipe name ("\\.\pipe\<name>"); creates the per-user directory.
+// <dir>/<name>.pipe with the name's bytes other than letters, digits, '.', '_' and '-' as %XX;
+// a name too long for a socket path becomes '~' and 32 hex digits of its SHA-256.
 int pipeSocketPath(const std::string& inSystemName, std::string& outPath);
 
 // The server end, one instance: EADDRINUSE while a live server of that name exists. A socket

@@ -2,8 +2,10 @@
 #include "zubase/platform/SysPipe.h"
 
 #include "zubase/platform/HandleTable.h"
+#include "zubase/platform/Sha256.h"
 #include "zubase/platform/UniqueFd.h"
 
+#include <array>
 #include <atomic>
 #include <cerrno>
 #include <chrono>
@@ -23,7 +25,7 @@ namespace ZuPlatform {
 
 namespace {
 
-const char* const sSystemPrefix = "\\\\.\\pipe\\";
+const char* const kSystemPrefix = "\\\\.\\pipe\\";
 
 // Descriptors are closed only when the last transfer using them has returned, so that a
 // descriptor number is never reused under a blocked call.
@@ -88,18 +90,24 @@ int pipeDirectory(std::string& outPath)
     return ownPrivateDirectory(outPath, true);
 }
 
-std::string encodedName(const std::string& inSystemName)
+std::string shortName(const std::string& inSystemName)
 {
     std::string name = inSystemName;
-    if (name.compare(0, std::strlen(sSystemPrefix), sSystemPrefix) == 0)
-        name.erase(0, std::strlen(sSystemPrefix));
+    if (name.compare(0, std::strlen(kSystemPrefix), kSystemPrefix) == 0)
+        name.erase(0, std::strlen(kSystemPrefix));
+    return name;
+}
+
+// The name as a file name: letters, digits, '.', '_' and '-' as they are, other bytes as %XX.
+std::string encodedName(const std::string& inName)
+{
+    static const char digits[] = "0123456789ABCDEF";
     std::string encoded;
-    for (unsigned char c : name) {
+    for (unsigned char c : inName) {
         if ((c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') ||
             c == '.' || c == '_' || c == '-') {
             encoded += static_cast<char>(c);
         } else {
-            static const char digits[] = "0123456789ABCDEF";
             encoded += '%';
             encoded += digits[c >> 4];
             encoded += digits[c & 15];
@@ -108,16 +116,31 @@ std::string encodedName(const std::string& inSystemName)
     return encoded;
 }
 
+// A name whose socket path would not fit sun_path gets '~' and 128 bits of its SHA-256. The
+// encoding never leaves a '~', so such names cannot meet the encoded ones.
+std::string hashedName(const std::string& inName)
+{
+    static const char digits[] = "0123456789abcdef";
+    const std::array<std::uint8_t, 32> digest = sha256(inName);
+    std::string hashed = "~";
+    for (int i = 0; i < 16; ++i) {
+        hashed += digits[digest[i] >> 4];
+        hashed += digits[digest[i] & 15];
+    }
+    return hashed;
+}
+
 int paths(const std::string& inSystemName, std::string& outSocket, std::string& outLock)
 {
     std::string dir;
     if (const int error = pipeDirectory(dir))
         return error;
-    const std::string base = dir + "/" + encodedName(inSystemName);
+    const std::string name = shortName(inSystemName);
+    std::string base = dir + "/" + encodedName(name);
+    if (base.size() + std::strlen(".pipe") >= sizeof(sockaddr_un::sun_path))
+        base = dir + "/" + hashedName(name);
     outSocket = base + ".pipe";
     outLock = base + ".lock";
-    if (outSocket.size() >= sizeof(sockaddr_un::sun_path))
-        return ENAMETOOLONG;
     return 0;
 }
 
