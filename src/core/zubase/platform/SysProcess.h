@@ -23,10 +23,11 @@ struct ProcessCreation
 };
 
 // Creates a child from a command line (Windows rules, WinCommandLine.h), suspended: the child
-// stops itself before it loads the program and runs only after resumeThread(). A Win32 backend
-// passes CREATE_NO_WINDOW | DETACHED_PROCESS | CREATE_SUSPENDED and a STARTUPINFO of size 68 on
-// the desktop "winsta0\\default". inEnvironmentBlock null inherits ours; an empty
-// inWorkingDirectory keeps ours. The child gets no standard streams and none of our descriptors.
+// stops itself before it loads the program and runs only after resumeThread(). The program is
+// the file the command line names, relative to the current folder, never looked up in PATH.
+// inEnvironmentBlock null inherits ours; an empty inWorkingDirectory keeps ours. The child gets
+// no standard streams and none of our descriptors. (A Win32 backend passes CREATE_NO_WINDOW |
+// DETACHED_PROCESS | CREATE_SUSPENDED and a STARTUPINFO of size 68 on "winsta0\\default".)
 int createProcessSuspended(const std::string& inCommandLine, const char* inEnvironmentBlock,
                            const std::string& inWorkingDirectory, ProcessCreation& outCreation);
 // Lets a suspended child run; outPreviousCount is 1 for a suspended child, else 0.
@@ -53,10 +54,14 @@ int processModules(Handle inProcess, std::vector<std::string>& outPaths);
 int processImageFileName(Handle inProcess, std::string& outPath);
 unsigned currentProcessId();
 
-// Starts inFile with inArguments through the system's elevation tool (pkexec, looked up in PATH).
-// Returns once the tool has let the program start or has refused it; a missing tool gives
-// ENOENT, a refused or declined request EACCES.
+// Starts inFile (relative to the current folder, never looked up in PATH) with inArguments
+// through the system's elevation tool, /usr/bin/pkexec. Returns once the tool has started the
+// program or has ended without: a missing tool gives ENOENT, a refused or declined request
+// EACCES. The start is seen when the tool's descriptors close on exec, so it does not depend
+// on process names, and what the program does afterwards does not change the answer.
 int shellExecuteElevated(const std::string& inFile, const std::vector<std::string>& inArguments);
+// Another elevation tool that behaves as pkexec does (tests use a stand-in); empty restores it.
+void setElevationTool(const std::string& inPath);
 
 // elevated: the effective user is root; admin: root or a member of sudo, wheel or admin.
 void elevationInfo(bool& outElevated, bool& outAdmin);

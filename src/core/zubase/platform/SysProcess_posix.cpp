@@ -37,6 +37,12 @@ namespace ZuPlatform {
 
 namespace {
 
+// The system's elevation tool, by absolute path, and its exit codes for a request it refused
+// or could not carry out.
+const char* const kElevationTool = "/usr/bin/pkexec";
+constexpr int kToolRefused = 126;
+constexpr int kToolFailed = 127;
+
 // A child this process created. Its reaper thread collects the exit status, so no child stays a
 // zombie whether or not anybody asks for its end.
 struct Child
@@ -176,18 +182,35 @@ bool statFields(pid_t inPid, std::vector<std::string>& outFields, std::string* o
     return !outFields.empty();
 }
 
-std::string findInPath(const std::string& inProgram)
+// The file the caller named, taken from the current folder when the path is relative: never
+// looked up in PATH, where another program of that name may be.
+int absoluteProgramPath(const std::string& inProgram, std::string& outPath)
 {
-    if (inProgram.find('/') != std::string::npos)
-        return inProgram;
-    const char* path = std::getenv("PATH");
-    std::istringstream dirs(path ? path : "/usr/local/bin:/usr/bin:/bin");
-    for (std::string dir; std::getline(dirs, dir, ':');) {
-        const std::string candidate = (dir.empty() ? std::string(".") : dir) + "/" + inProgram;
-        if (access(candidate.c_str(), X_OK) == 0)
-            return candidate;
-    }
-    return std::string();
+    outPath = inProgram;
+    if (inProgram.empty() || inProgram[0] == '/')
+        return 0;
+    char cwd[4096];
+    if (!getcwd(cwd, sizeof cwd))
+        return errno;
+    outPath = std::string(cwd) + "/" + inProgram;
+    return 0;
+}
+
+// Whether the process is ending or has ended: set as the first step of an exit, before its
+// descriptors close.
+bool isEnding(pid_t inPid)
+{
+    constexpr unsigned long kExitingFlag = 0x4; // PF_EXITING
+    std::vector<std::string> fields;
+    if (!statFields(inPid, fields) || fields[0] == "Z" || fields[0] == "X")
+        return true;
+    return fields.size() > 6 && (std::strtoul(fields[6].c_str(), nullptr, 10) & kExitingFlag);
+}
+
+std::string& elevationTool()
+{
+    static std::string* const sTool = new std::string(kElevationTool);
+    return *sTool;
 }
 
 std::vector<char*> pointers(std::vector<std::string>& inTexts)
@@ -212,20 +235,27 @@ void resetSignals()
     sigprocmask(SIG_SETMASK, &none, nullptr);
 }
 
-void closeDescriptorsFrom(int inFirst, int inKeep)
+// Closes every descriptor from 3 on except the (at most two) given ones.
+void closeOtherDescriptors(int inKeep1, int inKeep2 = UniqueFd::kNone)
 {
+    int keep[2] = {std::min(inKeep1, inKeep2), std::max(inKeep1, inKeep2)};
+    int first = 3;
 #ifdef SYS_close_range
-    if (inKeep >= inFirst) {
-        if ((inKeep == inFirst || syscall(SYS_close_range, inFirst, inKeep - 1, 0) == 0) &&
-            syscall(SYS_close_range, inKeep + 1, ~0u, 0) == 0)
-            return;
-    } else if (syscall(SYS_close_range, inFirst, ~0u, 0) == 0) {
-        return;
+    bool closed = true;
+    for (int kept : keep) {
+        if (kept < first)
+            continue;
+        if (kept > first && syscall(SYS_close_range, first, kept - 1, 0) != 0)
+            closed = false;
+        first = kept + 1;
     }
+    if (closed && syscall(SYS_close_range, first, ~0u, 0) == 0)
+        return;
+    first = 3;
 #endif
     const long limit = std::min(sysconf(_SC_OPEN_MAX), 65536L);
-    for (int fd = inFirst; fd < limit; ++fd) {
-        if (fd != inKeep)
+    for (int fd = first; fd < limit; ++fd) {
+        if (fd != keep[0] && fd != keep[1])
             close(fd);
     }
 }
@@ -255,15 +285,9 @@ int createProcessSuspended(const std::string& inCommandLine, const char* inEnvir
     std::vector<std::string> args = splitCommandLine(inCommandLine);
     if (args.empty() || args[0].empty())
         return ENOENT;
-    std::string program = findInPath(args[0]);
-    if (program.empty())
-        return ENOENT;
-    if (program[0] != '/') {
-        char cwd[4096];
-        if (!getcwd(cwd, sizeof cwd))
-            return errno;
-        program = std::string(cwd) + "/" + program;
-    }
+    std::string program;
+    if (const int error = absoluteProgramPath(args[0], program))
+        return error;
     struct stat info;
     if (stat(program.c_str(), &info) != 0)
         return errno;
@@ -301,7 +325,7 @@ int createProcessSuspended(const std::string& inCommandLine, const char* inEnvir
         dup2(devNull.get(), 2);
         if (dir && chdir(dir) != 0)
             writeErrorAndExit(errorWriter.get(), errno);
-        closeDescriptorsFrom(3, errorWriter.get());
+        closeOtherDescriptors(errorWriter.get());
         // Suspended: nothing of the program runs before the parent continues us.
         kill(getpid(), SIGSTOP);
         execve(program.c_str(), argv.data(), inEnvironmentBlock ? envp.data() : environ);
@@ -519,64 +543,75 @@ unsigned currentProcessId()
     return static_cast<unsigned>(getpid());
 }
 
+void setElevationTool(const std::string& inPath)
+{
+    elevationTool() = inPath.empty() ? kElevationTool : inPath;
+}
+
 int shellExecuteElevated(const std::string& inFile, const std::vector<std::string>& inArguments)
 {
-    const std::string tool = findInPath("pkexec");
-    if (tool.empty())
-        return ENOENT;
-    std::vector<std::string> args{tool, inFile};
+    const std::string tool = elevationTool();
+    if (access(tool.c_str(), X_OK) != 0)
+        return errno;
+    // The tool looks a relative program up in PATH: hand it the file the caller checked.
+    std::string program;
+    if (const int error = absoluteProgramPath(inFile, program))
+        return error;
+    std::vector<std::string> args{tool, program};
     args.insert(args.end(), inArguments.begin(), inArguments.end());
     std::vector<char*> argv = pointers(args);
 
-    std::string ownComm;
-    readFile("/proc/thread-self/comm", ownComm);
-    while (!ownComm.empty() && ownComm.back() == '\n')
-        ownComm.pop_back();
-
     int errorPipe[2];
+    int startPipe[2];
     if (pipe2(errorPipe, O_CLOEXEC) != 0)
         return errno;
     const UniqueFd errorReader(errorPipe[0]);
     UniqueFd errorWriter(errorPipe[1]);
+    if (pipe2(startPipe, O_CLOEXEC) != 0)
+        return errno;
+    const UniqueFd startReader(startPipe[0]);
+    UniqueFd startWriter(startPipe[1]);
+
     const pid_t pid = fork();
     if (pid < 0)
         return errno;
     if (pid == 0) {
         resetSignals();
-        closeDescriptorsFrom(3, errorWriter.get());
+        closeOtherDescriptors(errorWriter.get(), startWriter.get());
+        // The start pipe goes through our exec into the tool, which marks every descriptor
+        // above 2 close-on-exec before it replaces itself with the program.
+        fcntl(startWriter.get(), F_SETFD, 0);
         execv(tool.c_str(), argv.data());
         writeErrorAndExit(errorWriter.get(), errno);
     }
     errorWriter.reset();
-    // The pipe closes when the tool has been loaded, or carries the error of the attempt.
+    startWriter.reset();
+    // The error pipe closes when the tool has been loaded, or carries the error of the attempt.
     if (const int error = readError(errorReader.get())) {
         int status;
         while (waitpid(pid, &status, 0) < 0 && errno == EINTR) {
         }
         return error;
     }
-
-    std::shared_ptr<Child> child = adoptChild(pid, false);
-    // The tool asks the user, then replaces itself with the program; it ends with 126 or 127
-    // when the request was declined or not authorised. The program has started once the
-    // child's name is neither ours (it may not be updated yet) nor the tool's.
-    const std::string toolComm = tool.substr(tool.rfind('/') + 1).substr(0, 15);
-    std::vector<std::string> fields;
-    for (;;) {
-        {
-            std::lock_guard<std::mutex> lock(child->mutex);
-            if (child->ended) {
-                if (child->lost)
-                    return 0;
-                const int code = exitCodeOf(child->status, false, 0);
-                return code == 126 || code == 127 ? EACCES : 0;
-            }
-        }
-        std::string comm;
-        if (statFields(pid, fields, &comm) && comm != ownComm && comm != toolComm)
-            return 0;
-        std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    // The start pipe closes when the tool has started the program, or when it ends without:
+    // after a refusal, or a request the user declined (then it ends with 126 or 127).
+    char byte;
+    while (read(startReader.get(), &byte, 1) < 0 && errno == EINTR) {
     }
+    if (!isEnding(pid)) {
+        adoptChild(pid, false); // the program runs; collected when it ends
+        return 0;
+    }
+    int status = 0;
+    pid_t got;
+    do {
+        got = waitpid(pid, &status, 0);
+    } while (got < 0 && errno == EINTR);
+    if (got != pid)
+        return 0; // collected by the host: nothing tells that it failed
+    // Any other code is the program's own, of a program that ended at once.
+    const int code = exitCodeOf(status, false, 0);
+    return code == kToolRefused || code == kToolFailed ? EACCES : 0;
 }
 
 void elevationInfo(bool& outElevated, bool& outAdmin)
