@@ -305,6 +305,7 @@ void TestProcess::suspendedThenEnds()
     QFETCH(bool, terminate);
     QFETCH(bool, resume);
 
+    const std::size_t tracked = ZuPlatform::childrenTracked();
     RkLogCapture capture;
     const QString dump = nextDumpPath();
     ZuBase::Process process;
@@ -348,7 +349,9 @@ void TestProcess::suspendedThenEnds()
     capture.clear();
     QVERIFY(process.terminate(code).isBad());
     QVERIFY(!failureLines(capture).isEmpty());
+    // Once its handles are closed nothing of the child is kept.
     process.detach();
+    QTRY_COMPARE(ZuPlatform::childrenTracked(), tracked);
 }
 
 void TestProcess::processListing()

@@ -53,6 +53,8 @@ int processModules(Handle inProcess, std::vector<std::string>& outPaths);
 // The executable of the process.
 int processImageFileName(Handle inProcess, std::string& outPath);
 unsigned currentProcessId();
+// How many of our children the backend still keeps: those a handle or an unfinished wait holds.
+std::size_t childrenTracked();
 
 // Starts inFile (relative to the current folder, never looked up in PATH) with inArguments
 // through the system's elevation tool, /usr/bin/pkexec. Returns once the tool has started the

@@ -48,6 +48,7 @@ constexpr int kToolFailed = 127;
 struct Child
 {
     explicit Child(pid_t inPid) : pid(inPid) {}
+    ~Child();
     const pid_t pid;
     std::mutex mutex;
     bool suspended = false;
@@ -84,17 +85,22 @@ Children& children()
     return *instance;
 }
 
+// The last holder of a child lets go of it: its entry goes, unless a new child has the pid.
+Child::~Child()
+{
+    Children& c = children();
+    std::lock_guard<std::mutex> lock(c.mutex);
+    const auto found = c.byPid.find(pid);
+    if (found != c.byPid.end() && found->second.expired())
+        c.byPid.erase(found);
+}
+
 std::shared_ptr<Child> findChild(pid_t inPid)
 {
     Children& c = children();
     std::lock_guard<std::mutex> lock(c.mutex);
     const auto found = c.byPid.find(inPid);
-    if (found == c.byPid.end())
-        return nullptr;
-    std::shared_ptr<Child> child = found->second.lock();
-    if (!child)
-        c.byPid.erase(found);
-    return child;
+    return found == c.byPid.end() ? nullptr : found->second.lock();
 }
 
 // Waits for the end without collecting it first, so that the pid cannot be reused while
@@ -536,6 +542,13 @@ int processImageFileName(Handle inProcess, std::string& outPath)
         return errno;
     outPath.assign(buffer, static_cast<std::size_t>(length));
     return 0;
+}
+
+std::size_t childrenTracked()
+{
+    Children& c = children();
+    std::lock_guard<std::mutex> lock(c.mutex);
+    return c.byPid.size();
 }
 
 unsigned currentProcessId()
