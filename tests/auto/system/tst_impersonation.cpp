@@ -114,11 +114,14 @@ void TestImpersonation::initTestCase()
     const QString chpasswd = QStandardPaths::findExecutable("chpasswd", {"/usr/sbin", "/sbin"});
     if (useradd.isEmpty() || chpasswd.isEmpty())
         return;
-    // A throwaway account with one supplementary group.
+    // A throwaway account with one supplementary group, and an entry larger than the usual
+    // lookup buffer.
     sUser = QStringLiteral("zutst%1").arg(::getpid());
     sPassword = QStringLiteral("Pw-%1-secret").arg(::getpid());
+    const QString usermod = QStandardPaths::findExecutable("usermod", {"/usr/sbin", "/sbin"});
     mAccountMade = run(useradd, {"-M", "-s", "/usr/sbin/nologin", "-G", "users", sUser}) &&
-                   run(chpasswd, {}, (sUser + ':' + sPassword + '\n').toLocal8Bit());
+                   run(chpasswd, {}, (sUser + ':' + sPassword + '\n').toLocal8Bit()) &&
+                   run(usermod, {"-c", QString(20000, 'c'), sUser});
     if (const passwd* entry = ::getpwnam(qPrintable(sUser))) {
         mUid = entry->pw_uid;
         mGid = entry->pw_gid;

@@ -165,12 +165,32 @@ int pamError(int inCode)
     }
 }
 
+// Runs an account lookup (getpwnam_r, getpwuid_r, getgrgid_r) with a buffer that grows while
+// the entry does not fit: groups with long member lists and accounts with long comments need
+// more than the usual size.
+template <typename Entry, typename Lookup>
+int lookupEntry(Lookup inLookup, Entry& outEntry, std::vector<char>& outBuffer, Entry*& outFound)
+{
+    constexpr std::size_t kFirstSize = 16384;
+    constexpr std::size_t kLargestSize = std::size_t(1) << 24;
+    outBuffer.resize(kFirstSize);
+    int rc;
+    while ((rc = inLookup(&outEntry, outBuffer.data(), outBuffer.size(), &outFound)) == ERANGE &&
+           outBuffer.size() < kLargestSize)
+        outBuffer.resize(outBuffer.size() * 2);
+    return rc;
+}
+
 int accountOf(const std::string& inUser, AccountToken& outToken)
 {
-    std::vector<char> buffer(16384);
+    std::vector<char> buffer;
     passwd entry;
     passwd* found = nullptr;
-    const int rc = ::getpwnam_r(inUser.c_str(), &entry, buffer.data(), buffer.size(), &found);
+    const int rc = lookupEntry(
+        [&inUser](passwd* outEntry, char* outText, std::size_t inSize, passwd** outFound) {
+            return ::getpwnam_r(inUser.c_str(), outEntry, outText, inSize, outFound);
+        },
+        entry, buffer, found);
     if (rc != 0)
         return rc;
     if (!found)
@@ -445,14 +465,14 @@ template <typename Id, typename Entry>
 int lookupName(int (*inLookup)(Id, Entry*, char*, std::size_t, Entry**), char* Entry::*inName,
                Id inId, const char* inDomain, std::string& outDomain, std::string& outName)
 {
-    // Groups with long member lists need more than the usual buffer: grow it on ERANGE.
-    std::vector<char> buffer(16384);
+    std::vector<char> buffer;
     Entry entry;
     Entry* found = nullptr;
-    int rc;
-    while ((rc = inLookup(inId, &entry, buffer.data(), buffer.size(), &found)) == ERANGE &&
-           buffer.size() < (std::size_t(1) << 24))
-        buffer.resize(buffer.size() * 2);
+    const int rc = lookupEntry(
+        [&](Entry* outEntry, char* outText, std::size_t inSize, Entry** outFound) {
+            return inLookup(inId, outEntry, outText, inSize, outFound);
+        },
+        entry, buffer, found);
     if (rc != 0)
         return rc;
     if (!found)
