@@ -13,10 +13,13 @@
 #include <QTemporaryDir>
 #include <QtTest>
 
+#include <atomic>
 #include <grp.h>
+#include <linux/capability.h>
 #include <pwd.h>
 #include <sys/stat.h>
 #include <sys/syscall.h>
+#include <sys/wait.h>
 #include <thread>
 #include <unistd.h>
 
@@ -68,6 +71,14 @@ bool run(const QString& inProgram, const QStringList& inArgs, const QByteArray& 
     process.closeWriteChannel();
     return process.waitForFinished(30000) && process.exitStatus() == QProcess::NormalExit &&
            process.exitCode() == 0;
+}
+
+// Whether the calling thread holds CAP_KILL (in its permitted set).
+bool holdsCapKill()
+{
+    __user_cap_header_struct header{_LINUX_CAPABILITY_VERSION_3, 0};
+    __user_cap_data_struct data[_LINUX_CAPABILITY_U32S_3] = {};
+    return ::syscall(SYS_capget, &header, data) == 0 && (data[0].permitted & (1u << CAP_KILL));
 }
 
 bool createFile(const QString& inPath)
@@ -255,32 +266,17 @@ void TestImpersonation::adjustPrivilege()
 {
     if (!mRoot)
         QSKIP("capabilities to adjust are held only by root");
-    // Removing a privilege is for good, so it is done on a thread of its own.
     RkLogCapture capture;
-    QList<bool> results;
-    QStringList after;
-    std::thread worker([&] {
-        const std::pair<const char*, bool> steps[] = {
-            {"SeRestorePrivilege", true},
-            {"cap_fowner", true}, // or a capability's own name
-            {"SeNoSuchPrivilege", true},
-            {"cap_kill", false},
-            {"cap_kill", true}};
-        for (const auto& [name, enable] : steps)
-            results << ZuBase::win32TokenAdjustPrivilege(sProcessToken, const_cast<char*>(name),
-                                                         enable)
-                           .isOk();
-        RkLogCapture dump;
-        ZuBase::win32TokenLog("after", sProcessToken);
-        after = dumpLines(dump);
-    });
-    worker.join();
-    QCOMPARE(results, QList<bool>({true, true, false, true, true}));
-    // Removed for good: enabling it again leaves it absent.
-    QCOMPARE(after.filter("cap_kill"), QStringList());
-    QVERIFY(after.contains("        SeRestorePrivilege  [0x2]"));
-    // Only a token that is no token makes the adjustment itself fail.
-    QVERIFY(ZuBase::win32TokenAdjustPrivilege(nullptr, (char*)"SeRestorePrivilege", true).isBad());
+    const auto adjust = [](void* inToken, const char* inName, bool inEnable) {
+        return ZuBase::win32TokenAdjustPrivilege(inToken, const_cast<char*>(inName), inEnable)
+            .isOk();
+    };
+    // A held privilege by its usual name or a capability's own name; an unknown name and a
+    // token that is no token fail.
+    QVERIFY(adjust(sProcessToken, "SeRestorePrivilege", true));
+    QVERIFY(adjust(sProcessToken, "cap_fowner", true));
+    QVERIFY(!adjust(sProcessToken, "SeNoSuchPrivilege", true));
+    QVERIFY(!adjust(nullptr, "SeRestorePrivilege", true));
     const QStringList errors = logLines(capture, nullptr, RkLogError);
     QCOMPARE(errors.size(), 2);
     QVERIFY2(errors.at(0).startsWith("::LookupPrivilegeValue SeNoSuchPrivilege -> 0, last error"),
@@ -288,10 +284,44 @@ void TestImpersonation::adjustPrivilege()
     QVERIFY(
         errors.at(1).startsWith("::AdjustTokenPrivileges SeRestorePrivilege -> 0, last error 9:"));
 
-    // The other threads keep it.
-    RkLogCapture mainDump;
-    ZuBase::win32TokenLog("main", sProcessToken);
-    QVERIFY(dumpLines(mainDump).contains("        cap_kill  [0x2]"));
+    // Removing is for good and reaches every thread, also one that was running before the
+    // call; enabling it again leaves it absent. Done in a process of its own.
+    int report[2];
+    QCOMPARE(::pipe(report), 0);
+    const pid_t pid = ::fork();
+    QVERIFY(pid >= 0);
+    if (pid == 0) {
+        std::atomic<bool> removed{false};
+        bool bystanderHolds = true;
+        std::thread bystander([&] {
+            while (!removed)
+                ::usleep(1000);
+            bystanderHolds = holdsCapKill();
+        });
+        const bool removeOk = adjust(sProcessToken, "cap_kill", false);
+        const bool enableOk = adjust(sProcessToken, "cap_kill", true);
+        removed = true;
+        bystander.join();
+        RkLogCapture dump;
+        ZuBase::win32TokenLog("after", sProcessToken);
+        const QByteArray verdict =
+            QByteArray::number(removeOk) + QByteArray::number(enableOk) +
+            QByteArray::number(bystanderHolds) + QByteArray::number(holdsCapKill()) +
+            QByteArray::number(!dumpLines(dump).filter("cap_kill").isEmpty());
+        ::_exit(::write(report[1], verdict.constData(), size_t(verdict.size())) == verdict.size()
+                    ? 0
+                    : 1);
+    }
+    ::close(report[1]);
+    char verdict[8] = {};
+    const ssize_t got = ::read(report[0], verdict, sizeof verdict - 1);
+    ::close(report[0]);
+    int status = 0;
+    QCOMPARE(::waitpid(pid, &status, 0), pid);
+    QVERIFY(got > 0);
+    // Removed and enabled fine, then held by neither thread nor listed in the dump.
+    QCOMPARE(QByteArray(verdict), QByteArray("11000"));
+    QVERIFY(holdsCapKill()); // this process is not touched
 }
 
 void TestImpersonation::loginWithoutCallbackOrPassword()
