@@ -104,6 +104,7 @@ private slots:
     void removeFile();
     void removeDir_data();
     void removeDir();
+    void removeDirDoesNotFollowASwappedFolder();
     void reparseBufferBytes();
     void reparseBufferParse_data();
     void reparseBufferParse();
@@ -344,6 +345,30 @@ void TestFile::removeDir()
         if (layout == "tree" && !remaining.contains(file))
             QVERIFY(trace.contains(QString("QFile::remove() [%1] -> ok").arg(root.filePath(file))));
     }
+}
+
+void TestFile::removeDirDoesNotFollowASwappedFolder()
+{
+    // After the first file in "sub" has gone, "sub" is swapped for a link to a folder with
+    // files of the same names: the rest of the walk must stay in the folder it opened.
+    QTemporaryDir root;
+    const QString top = root.filePath("top");
+    const QStringList names{"f1", "f2", "f3"};
+    for (const QString& name : names) {
+        makeFile(top + "/sub/" + name);
+        makeFile(root.filePath("outside/") + name);
+    }
+    bool swapped = false;
+    const int sink = getTheLogInstance().addSink([&](const RkLogEntry& inEntry) {
+        if (!swapped && inEntry.text.find("/sub/") != std::string::npos)
+            swapped = QDir().rename(top + "/sub", top + "/moved") &&
+                      QFile::link(root.filePath("outside"), top + "/sub");
+    });
+    ZuBase::File::removeDir(top, true, {}, {});
+    getTheLogInstance().removeSink(sink);
+    QVERIFY(swapped);
+    QCOMPARE(QDir(root.filePath("outside")).entryList(QDir::Files), names);
+    QCOMPARE(QDir(top + "/moved").entryList(QDir::Files), QStringList());
 }
 
 void TestFile::reparseBufferBytes()

@@ -9,6 +9,7 @@
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
+#include <QRegularExpression>
 
 namespace {
 
@@ -37,6 +38,87 @@ void traceRemoval(const char* inFormat, const QString& inPath, bool inGone)
 {
     getTheLogInstance().tracef(inGone ? RkLogInfo : RkLogWarning, sCategory, inFormat,
                                Q2M(inPath).constData(), inGone ? "ok" : "fail");
+}
+
+// An opened folder of the removal walk, closed with the object.
+struct Folder
+{
+    ~Folder() { ZuPlatform::filesCloseFolder(handle); }
+    ZuPlatform::FolderHandle handle = ZuPlatform::kInvalidHandle;
+};
+
+// Name filters as QDir applies them when listing: wildcards, case-insensitive.
+QList<QRegularExpression> wildcards(const QStringList& inFilters)
+{
+    QList<QRegularExpression> patterns;
+    for (const QString& filter : inFilters)
+        patterns << QRegularExpression(QRegularExpression::wildcardToRegularExpression(filter),
+                                       QRegularExpression::CaseInsensitiveOption);
+    return patterns;
+}
+
+bool matchesAny(const QList<QRegularExpression>& inPatterns, const QString& inName)
+{
+    for (const QRegularExpression& pattern : inPatterns) {
+        if (pattern.match(inName).hasMatch())
+            return true;
+    }
+    return false;
+}
+
+struct RemovalFilters
+{
+    QList<QRegularExpression> names; // none: every file
+    QList<QRegularExpression> kept;
+    bool keeping; // a keep list was given: it keeps every folder too
+    bool recursive;
+};
+
+void removeEntries(ZuPlatform::FolderHandle inFolder, const QString& inPath,
+                   const RemovalFilters& inFilters);
+
+// A folder below the one being emptied, reached through its opened parent: the same steps as
+// the top one, with links removed themselves and never followed.
+void removeSubfolder(ZuPlatform::FolderHandle inParent, const std::string& inName,
+                     const QString& inPath, const RemovalFilters& inFilters)
+{
+    ZuPlatform::filesRemoveEntry(inParent, inName, true);
+    ZuPlatform::filesRemoveEntry(inParent, inName, false);
+    if (!ZuPlatform::filesEntryExists(inParent, inName))
+        return;
+    Folder folder;
+    if (ZuPlatform::filesOpenFolder(inParent, inName, folder.handle) == 0)
+        removeEntries(folder.handle, inPath, inFilters);
+    ZuPlatform::filesRemoveEntry(inParent, inName, true);
+    traceRemoval("QDir::rmdir() [%s] -> %s", inPath,
+                 !ZuPlatform::filesEntryExists(inParent, inName));
+}
+
+// Lists the folder as QDir does with files, all folders, hidden and system entries, unsorted,
+// and removes the listed entries from the last to the first.
+void removeEntries(ZuPlatform::FolderHandle inFolder, const QString& inPath,
+                   const RemovalFilters& inFilters)
+{
+    std::vector<ZuPlatform::FolderEntry> entries;
+    if (ZuPlatform::filesListFolder(inFolder, entries) != 0)
+        return;
+    for (auto entry = entries.rbegin(); entry != entries.rend(); ++entry) {
+        const QString name = QFile::decodeName(QByteArray::fromStdString(entry->name));
+        const bool folder = entry->kind != ZuPlatform::EntryKind::File;
+        if (!folder && !inFilters.names.isEmpty() && !matchesAny(inFilters.names, name))
+            continue; // not listed
+        if (inFilters.keeping && (folder || matchesAny(inFilters.kept, name)))
+            continue;
+        const QString path = inPath + QLatin1Char('/') + name;
+        if (folder) {
+            if (inFilters.recursive)
+                removeSubfolder(inFolder, entry->name, path, inFilters);
+            continue;
+        }
+        ZuPlatform::filesRemoveEntry(inFolder, entry->name, false);
+        traceRemoval("QFile::remove() [%s] -> %s", path,
+                     !ZuPlatform::filesEntryExists(inFolder, entry->name));
+    }
 }
 
 // Opens a directory's reparse point, with the restore privilege raised first as writing or
@@ -132,32 +214,14 @@ RkResult removeDir(const QString& inDirPath, bool inRecursive, const QStringList
     if (!self.exists() && !self.isSymLink())
         return res;
 
-    QFileInfoList entries;
-    QFileInfoList kept;
-    if (!self.isSymLink()) {
-        const QDir dir(inDirPath);
-        const QDir::Filters filter =
-            QDir::Files | QDir::AllDirs | QDir::Hidden | QDir::System | QDir::NoDotAndDotDot;
-        entries = dir.entryInfoList(inNameFilters, filter, QDir::Unsorted);
-        if (!inKeepFilters.isEmpty())
-            kept = dir.entryInfoList(inKeepFilters, filter, QDir::Unsorted);
+    // A link is not listed at all: opening it as a folder fails.
+    Folder folder;
+    if (ZuPlatform::filesOpenFolder(ZuPlatform::kInvalidHandle, Q2M(inDirPath).toStdString(),
+                                    folder.handle) == 0) {
+        const RemovalFilters filters{wildcards(inNameFilters), wildcards(inKeepFilters),
+                                     !inKeepFilters.isEmpty(), inRecursive};
+        removeEntries(folder.handle, QDir(inDirPath).absolutePath(), filters);
     }
-    for (int i = entries.size() - 1; i >= 0; --i) {
-        const QFileInfo& entry = entries.at(i);
-        if (kept.contains(entry))
-            continue;
-        // A link to a directory counts as a directory: removeDir() drops the link itself.
-        if (entry.isDir()) {
-            if (inRecursive)
-                removeDir(entry.absoluteFilePath(), inRecursive, inNameFilters, inKeepFilters);
-            continue;
-        }
-        const QString path = entry.absoluteFilePath();
-        QFile::remove(path);
-        traceRemoval("QFile::remove() [%s] -> %s", path,
-                     !QFileInfo(path).exists() && !QFileInfo(path).isSymLink());
-    }
-
     QDir().rmdir(inDirPath);
     traceRemoval("QDir::rmdir() [%s] -> %s", inDirPath, !QFileInfo::exists(inDirPath));
     return res;
