@@ -1,8 +1,11 @@
 #include "rklib/RkLogFile.h"
 
+#include <atomic>
+#include <cerrno>
 #include <cstdarg>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <ctime>
 #include <map>
 #include <shared_mutex>
@@ -36,6 +39,41 @@ long currentThreadId()
     return long(::syscall(SYS_gettid));
 }
 
+// Control characters written as C escapes (a line feed as backslash and n, an escape character
+// as backslash, x1b), so that one call stays one line and a logged value can neither forge
+// lines nor drive a terminal. Tabs stay.
+std::string escapedControls(const std::string& inText)
+{
+    std::string text;
+    text.reserve(inText.size());
+    for (const char c : inText) {
+        const unsigned char byte = static_cast<unsigned char>(c);
+        if ((byte >= 0x20 && byte != 0x7F) || c == '\t') {
+            text += c;
+        } else if (c == '\n') {
+            text += "\\n";
+        } else if (c == '\r') {
+            text += "\\r";
+        } else {
+            static const char digits[] = "0123456789abcdef";
+            text += "\\x";
+            text += digits[byte >> 4];
+            text += digits[byte & 15];
+        }
+    }
+    return text;
+}
+
+// Says once per process on standard error why a setting of the environment is not used.
+void complainOnce(std::atomic<bool>& ioSaid, const std::string& inText)
+{
+    if (!ioSaid.exchange(true))
+        std::fprintf(stderr, "zubase: %s\n", inText.c_str());
+}
+
+std::atomic<bool> sLevelComplaint{false};
+std::atomic<bool> sFileComplaint{false};
+
 } // namespace
 
 struct RkLogFile::Private
@@ -43,7 +81,7 @@ struct RkLogFile::Private
     std::mutex outputMutex;
     std::FILE* output = stderr;
     bool ownsOutput = false;
-    RkLogLevel outputLevel = RkLogInfo;
+    std::atomic<RkLogLevel> outputLevel{RkLogInfo}; // read by every write without a lock
 
     std::mutex sinkMutex;
     // Held shared while sinks run, exclusively by removeSink(), so that a removed sink is
@@ -58,12 +96,21 @@ struct RkLogFile::Private
 RkLogFile::RkLogFile() : d(new Private)
 {
     if (const char* level = std::getenv("ZUBASE_LOG_LEVEL"); level && *level) {
-        const int value = std::atoi(level);
-        if (value >= RkLogDebug && value <= RkLogOff)
+        char* end = nullptr;
+        errno = 0;
+        const long value = std::strtol(level, &end, 10);
+        if (errno == 0 && *end == '\0' && value >= RkLogDebug && value <= RkLogOff)
             d->outputLevel = RkLogLevel(value);
+        else
+            complainOnce(sLevelComplaint, std::string("ZUBASE_LOG_LEVEL \"") + level +
+                                              "\" is no level from 0 to 5; the log keeps level 1");
     }
-    if (const char* path = std::getenv("ZUBASE_LOG_FILE"); path && *path)
-        setOutputFile(path);
+    if (const char* path = std::getenv("ZUBASE_LOG_FILE"); path && *path) {
+        if (!setOutputFile(path))
+            complainOnce(sFileComplaint, std::string("cannot open ZUBASE_LOG_FILE \"") + path +
+                                             "\" (" + std::strerror(errno) +
+                                             "); the log goes to standard error");
+    }
 }
 
 RkLogFile::~RkLogFile()
@@ -115,10 +162,10 @@ void RkLogFile::write(RkLogLevel inLevel, const char* inCategory, const std::str
     entry.time = std::chrono::system_clock::now();
     entry.thread = currentThreadId();
     entry.level = inLevel;
-    entry.category = inCategory ? inCategory : "";
-    entry.text = inText;
+    entry.category = escapedControls(inCategory ? inCategory : "");
+    entry.text = escapedControls(inText);
 
-    if (inLevel >= d->outputLevel && inLevel < RkLogOff) {
+    if (inLevel >= d->outputLevel.load() && inLevel < RkLogOff) {
         const std::string line = formatLine(entry) + '\n';
         std::lock_guard<std::mutex> lock(d->outputMutex);
         std::fwrite(line.data(), 1, line.size(), d->output);
@@ -154,20 +201,20 @@ void RkLogFile::setWriteCallback(WriteCallback inCallback, RkLogLevel inLevel)
 
 void RkLogFile::setOutputLevel(RkLogLevel inLevel)
 {
-    std::lock_guard<std::mutex> lock(d->outputMutex);
     d->outputLevel = inLevel;
 }
 
 RkLogLevel RkLogFile::outputLevel() const
 {
-    return d->outputLevel;
+    return d->outputLevel.load();
 }
 
 bool RkLogFile::setOutputFile(const std::string& inPath)
 {
     std::FILE* file = stderr;
     if (!inPath.empty()) {
-        file = std::fopen(inPath.c_str(), "a");
+        // Close-on-exec ("e"): the children the library starts must not inherit the log.
+        file = std::fopen(inPath.c_str(), "ae");
         if (!file)
             return false;
     }

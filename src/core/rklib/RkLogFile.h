@@ -34,7 +34,10 @@ struct RkLogEntry
 // The process-wide log. Thread-safe; every call writes exactly one line
 // "<time> [<thread>] <level letter> <category>: <text>" (no category: "... <level letter> <text>")
 // to stderr, or to the file named by ZUBASE_LOG_FILE. ZUBASE_LOG_LEVEL (0..5, default 1) is the
-// lowest level written there. Sinks (RkLogCapture in tests) and the write callback see every line.
+// lowest level written there; a value that is no level, or a file that cannot be opened, is
+// said once on stderr and the default kept. Control characters in a text are written as C
+// escapes ("\n", "\x1b"), tabs as they are. Sinks (RkLogCapture in tests) and the write
+// callback see every line.
 class RKLIB_EXPORT RkLogFile
 {
 public:

@@ -9,6 +9,7 @@
 #include "rklib/RkVersion.h"
 #include "rklib/Tz.h"
 
+#include <QDir>
 #include <QTemporaryDir>
 #include <QtTest>
 
@@ -16,6 +17,9 @@
 #include <cerrno>
 #include <set>
 #include <thread>
+
+#include <fcntl.h>
+#include <unistd.h>
 
 namespace {
 
@@ -310,24 +314,66 @@ void TestRkLib::logFromManyThreadsKeepsLines()
 
 void TestRkLib::logFileFromEnvironmentFormat()
 {
+    // A file and a level from the environment; one call is one line, whatever the text holds.
     QTemporaryDir dir;
     const QString path = dir.filePath("log.txt");
-    RkLogFile log;
-    QVERIFY(log.setOutputFile(path.toStdString()));
-    log.setOutputLevel(RkLogInfo);
-    log.tracef(RkLogDebug, "ZuBase", "not written");
-    log.print("ZuBase", "hello");
-    log.printf("plain %d", 42);
-    QVERIFY(log.setOutputFile(std::string()));
+    qputenv("ZUBASE_LOG_FILE", path.toLocal8Bit());
+    qputenv("ZUBASE_LOG_LEVEL", "2");
+    bool closedOnExec = false;
+    {
+        RkLogFile log;
+        QCOMPARE(log.outputLevel(), RkLogWarning);
+        log.printf("not written");
+        log.tracef(RkLogWarning, "ZuBase", "value [%s]", "a\nE Tz: forged\r\x1b[2J\tb");
+        // The children the library starts must not inherit the log file.
+        for (const QFileInfo& fd :
+             QDir("/proc/self/fd").entryInfoList(QDir::Files | QDir::System)) {
+            if (fd.symLinkTarget() == path)
+                closedOnExec = fcntl(fd.fileName().toInt(), F_GETFD) & FD_CLOEXEC;
+        }
+    }
+    QVERIFY(closedOnExec);
     QFile file(path);
     QVERIFY(file.open(QIODevice::ReadOnly));
     const QStringList lines = QString::fromUtf8(file.readAll()).split('\n', Qt::SkipEmptyParts);
-    QCOMPARE(lines.size(), 2);
-    const QRegularExpression line(
-        R"(^\d{4}-\d\d-\d\d \d\d:\d\d:\d\d\.\d{3} \[\d+\] I (ZuBase: hello|plain 42)$)");
-    QVERIFY2(line.match(lines[0]).hasMatch(), qPrintable(lines[0]));
-    QVERIFY2(lines[0].endsWith("I ZuBase: hello"), qPrintable(lines[0]));
-    QVERIFY2(lines[1].endsWith("I plain 42"), qPrintable(lines[1]));
+    QCOMPARE(lines.size(), 1);
+    QVERIFY2(QRegularExpression(R"(^\d{4}-\d\d-\d\d \d\d:\d\d:\d\d\.\d{3} \[\d+\] W ZuBase: )")
+                 .match(lines[0])
+                 .hasMatch(),
+             qPrintable(lines[0]));
+    QVERIFY2(lines[0].endsWith("value [a\\nE Tz: forged\\r\\x1b[2J\tb]"), qPrintable(lines[0]));
+
+    // What cannot be used is said once on standard error, and the defaults stay.
+    qputenv("ZUBASE_LOG_FILE", dir.filePath("missing/log.txt").toLocal8Bit());
+    qputenv("ZUBASE_LOG_LEVEL", "1x");
+    const QString errors = dir.filePath("stderr.txt");
+    std::fflush(stderr);
+    const int savedStderr = dup(STDERR_FILENO);
+    QFile errorFile(errors);
+    QVERIFY(errorFile.open(QIODevice::WriteOnly));
+    dup2(errorFile.handle(), STDERR_FILENO);
+    RkLogLevel level = RkLogOff;
+    {
+        RkLogFile first;
+        RkLogFile second;
+        level = first.outputLevel();
+        first.printf("to standard error");
+    }
+    std::fflush(stderr);
+    dup2(savedStderr, STDERR_FILENO);
+    close(savedStderr);
+    errorFile.close();
+    qunsetenv("ZUBASE_LOG_FILE");
+    qunsetenv("ZUBASE_LOG_LEVEL");
+    QCOMPARE(level, RkLogInfo);
+    QVERIFY(errorFile.open(QIODevice::ReadOnly));
+    const QStringList said = QString::fromUtf8(errorFile.readAll()).split('\n', Qt::SkipEmptyParts);
+    QCOMPARE(said.size(), 3);
+    QCOMPARE(said[0], "zubase: ZUBASE_LOG_LEVEL \"1x\" is no level from 0 to 5; the log keeps "
+                      "level 1");
+    QCOMPARE(said[1], "zubase: cannot open ZUBASE_LOG_FILE \"" + dir.filePath("missing/log.txt") +
+                          "\" (No such file or directory); the log goes to standard error");
+    QVERIFY(said[2].endsWith(" I to standard error"));
 }
 
 void TestRkLib::handleCounting()
