@@ -39,9 +39,10 @@ long currentThreadId()
     return long(::syscall(SYS_gettid));
 }
 
-// Control characters written as C escapes (a line feed as backslash and n, an escape character
-// as backslash, x1b), so that one call stays one line and a logged value can neither forge
-// lines nor drive a terminal. Tabs stay.
+// Control characters written to the output as C escapes (a line feed as backslash and n, an
+// escape character as backslash, x1b), so that one call stays one line there and a logged value
+// can neither forge lines nor drive a terminal. Tabs stay. Sinks and the write callback get the
+// text as it was given.
 std::string escapedControls(const std::string& inText)
 {
     std::string text;
@@ -162,8 +163,8 @@ void RkLogFile::write(RkLogLevel inLevel, const char* inCategory, const std::str
     entry.time = std::chrono::system_clock::now();
     entry.thread = currentThreadId();
     entry.level = inLevel;
-    entry.category = escapedControls(inCategory ? inCategory : "");
-    entry.text = escapedControls(inText);
+    entry.category = inCategory ? inCategory : "";
+    entry.text = inText;
 
     if (inLevel >= d->outputLevel.load() && inLevel < RkLogOff) {
         const std::string line = formatLine(entry) + '\n';
@@ -262,8 +263,8 @@ std::string RkLogFile::formatLine(const RkLogEntry& inEntry)
         levelLetters[inEntry.level >= 0 && inEntry.level <= RkLogOff ? inEntry.level : 5]);
     std::string line = stamp;
     if (!inEntry.category.empty())
-        line += inEntry.category + ": ";
-    line += inEntry.text;
+        line += escapedControls(inEntry.category) + ": ";
+    line += escapedControls(inEntry.text);
     return line;
 }
 
@@ -345,8 +346,8 @@ std::vector<std::string> RkLogCapture::lines() const
             1, levelLetters[entry.level >= 0 && entry.level <= RkLogOff ? entry.level : 5]);
         line += ' ';
         if (!entry.category.empty())
-            line += entry.category + ": ";
-        result.push_back(line + entry.text);
+            line += escapedControls(entry.category) + ": ";
+        result.push_back(line + escapedControls(entry.text));
     }
     return result;
 }
