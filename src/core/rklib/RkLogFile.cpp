@@ -247,7 +247,7 @@ void RkLogFile::removeSink(int inId)
 
 std::string RkLogFile::formatLine(const RkLogEntry& inEntry)
 {
-    static const char levelLetters[] = "DIWEF-";
+    static const char kLevelLetters[] = "DIWEF-";
     const std::time_t seconds = std::chrono::system_clock::to_time_t(inEntry.time);
     const auto millis =
         std::chrono::duration_cast<std::chrono::milliseconds>(inEntry.time.time_since_epoch())
@@ -260,7 +260,7 @@ std::string RkLogFile::formatLine(const RkLogEntry& inEntry)
         stamp, sizeof stamp, "%04d-%02d-%02d %02d:%02d:%02d.%03d [%ld] %c ", local.tm_year + 1900,
         local.tm_mon + 1, local.tm_mday, local.tm_hour, local.tm_min, local.tm_sec, int(millis),
         inEntry.thread,
-        levelLetters[inEntry.level >= 0 && inEntry.level <= RkLogOff ? inEntry.level : 5]);
+        kLevelLetters[inEntry.level >= 0 && inEntry.level <= RkLogOff ? inEntry.level : 5]);
     std::string line = stamp;
     if (!inEntry.category.empty())
         line += escapedControls(inEntry.category) + ": ";
@@ -338,12 +338,12 @@ std::vector<std::string> RkLogCapture::texts(const std::string& inCategory) cons
 
 std::vector<std::string> RkLogCapture::lines() const
 {
-    static const char levelLetters[] = "DIWEF-";
+    static const char kLevelLetters[] = "DIWEF-";
     std::lock_guard<std::mutex> lock(mMutex);
     std::vector<std::string> result;
     for (const RkLogEntry& entry : mEntries) {
         std::string line(
-            1, levelLetters[entry.level >= 0 && entry.level <= RkLogOff ? entry.level : 5]);
+            1, kLevelLetters[entry.level >= 0 && entry.level <= RkLogOff ? entry.level : 5]);
         line += ' ';
         if (!entry.category.empty())
             line += escapedControls(entry.category) + ": ";

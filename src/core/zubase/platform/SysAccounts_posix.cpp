@@ -94,7 +94,7 @@ struct PrivilegeName
     cap_value_t capability;
 };
 // The capabilities that do the work of the account privileges of the same purpose.
-const PrivilegeName sPrivilegeNames[] = {
+const PrivilegeName kPrivilegeNames[] = {
     {"SeBackupPrivilege", CAP_DAC_READ_SEARCH}, {"SeRestorePrivilege", CAP_DAC_OVERRIDE},
     {"SeTakeOwnershipPrivilege", CAP_CHOWN},    {"SeSecurityPrivilege", CAP_FOWNER},
     {"SeShutdownPrivilege", CAP_SYS_BOOT},      {"SeSystemtimePrivilege", CAP_SYS_TIME},
@@ -303,7 +303,7 @@ std::vector<pid_t> threadsOfProcess()
 int changeProcessCapability(int inCapability, bool inRemove)
 {
     std::lock_guard<std::mutex> lock(sBroadcastMutex);
-    static const bool sInstalled = [] {
+    static const bool handlerInstalled = [] {
         struct sigaction action;
         std::memset(&action, 0, sizeof action);
         action.sa_sigaction = &onBroadcast;
@@ -316,7 +316,7 @@ int changeProcessCapability(int inCapability, bool inRemove)
     const int enabled = inRemove ? -1 : inCapability;
     if (const int error = applyToThisThread(enabled))
         return error;
-    if (!sInstalled)
+    if (!handlerInstalled)
         return ENOSYS;
 
     sEnabledCapability = enabled;
@@ -530,7 +530,7 @@ int accountsGetTokenInformation(const AccountToken* inToken, TokenInformation in
 int accountsLookupPrivilegeValue(const std::string& inName, std::uint32_t& outPrivilege)
 {
     outPrivilege = 0;
-    for (const PrivilegeName& entry : sPrivilegeNames) {
+    for (const PrivilegeName& entry : kPrivilegeNames) {
         if (::strcasecmp(entry.name, inName.c_str()) == 0) {
             outPrivilege = static_cast<std::uint32_t>(entry.capability);
             return 0;
@@ -549,7 +549,7 @@ int accountsLookupPrivilegeName(std::uint32_t inPrivilege, std::string& outName)
     outName.clear();
     if (inPrivilege > static_cast<std::uint32_t>(CAP_LAST_CAP))
         return EINVAL;
-    for (const PrivilegeName& entry : sPrivilegeNames) {
+    for (const PrivilegeName& entry : kPrivilegeNames) {
         if (static_cast<std::uint32_t>(entry.capability) == inPrivilege) {
             outName = entry.name;
             return 0;

@@ -13,7 +13,7 @@
 
 namespace {
 
-const char* const sCategory = "ZuBase";
+const char* const kCategory = "ZuBase";
 
 // Absolute, with native separators; empty stays empty.
 QString nativeAbsolutePath(const QString& inPath)
@@ -36,7 +36,7 @@ QString fromU16(const std::u16string& inText)
 
 void traceRemoval(const char* inFormat, const QString& inPath, bool inGone)
 {
-    getTheLogInstance().tracef(inGone ? RkLogInfo : RkLogWarning, sCategory, inFormat,
+    getTheLogInstance().tracef(inGone ? RkLogInfo : RkLogWarning, kCategory, inFormat,
                                Q2M(inPath).constData(), inGone ? "ok" : "fail");
 }
 
@@ -180,10 +180,7 @@ RkResult writeAll(QIODevice& inDevice, void* inData, qint64 inSize)
     qint64 remaining = inSize;
     while (remaining > 0) {
         const qint64 numBytesDone = inDevice.write(data, remaining);
-        if (Tz::fail(RK_CHECK(numBytesDone > 0, "numBytesDone > 0", "Internal Error"))) {
-            res.makeBad(1);
-            return res;
-        }
+        ZU_CHECK_RETURN(res, RK_CHECK(numBytesDone > 0, "numBytesDone > 0", "Internal Error"));
         data += numBytesDone;
         remaining -= numBytesDone;
     }
@@ -196,10 +193,9 @@ RkResult removeFile(const QString& inFilePath)
     if (!QFile::exists(inFilePath))
         return res;
     QFile::remove(inFilePath);
-    traceRemoval("QFile::remove() [%s] -> %s", inFilePath, !QFile::exists(inFilePath));
-    if (Tz::fail(
-            RK_CHECK(!QFile::exists(inFilePath), "!QFile::exists(inFilePath)", "Internal Error")))
-        res.makeBad(1);
+    const bool gone = !QFile::exists(inFilePath);
+    traceRemoval("QFile::remove() [%s] -> %s", inFilePath, gone);
+    ZU_CHECK_RETURN(res, RK_CHECK(gone, "!QFile::exists(inFilePath)", "Internal Error"));
     return res;
 }
 
@@ -240,14 +236,10 @@ RkResult junctionCreate(const QString& inJunctionPath, const QString& inTargetPa
     ZuPlatform::ReparseHandle hDirMountPoint;
 
     const int createError = ZuPlatform::filesCreateDirectory(path);
-    const bool bret = createError == 0;
-    if (!bret && createError != EEXIST) {
-        if (Tz::failWin(RK_CHECK(bret, "bret", "::CreateDirectoryW"), createError)) {
-            res.makeBad(1);
-            return res;
-        }
-    }
-    const bool createdHere = bret;
+    // A folder already there is used as it is; any other failure is recorded as "bret".
+    const bool createdHere = createError == 0;
+    if (createError != EEXIST)
+        ZU_CHECK_WIN_RETURN(res, RK_CHECK(createdHere, "bret", "::CreateDirectoryW"), createError);
 
     const int openError = openMountPoint(path, hDirMountPoint);
     if (Tz::failWin(
@@ -283,12 +275,9 @@ RkResult junctionInfo(const QString& inPath, bool& outIsJunction, QString& outTa
     const std::string path = Q2M(nativeAbsolutePath(inPath)).toStdString();
     ZuPlatform::ReparseHandle hDirMountPoint;
     const int openError = openMountPoint(path, hDirMountPoint);
-    if (Tz::failWin(
-            RK_CHECK(openError == 0, "hDirMountPoint!=((HANDLE)(LONG_PTR)-1)", "::CreateFileW"),
-            openError)) {
-        res.makeBad(1);
-        return res;
-    }
+    ZU_CHECK_WIN_RETURN(
+        res, RK_CHECK(openError == 0, "hDirMountPoint!=((HANDLE)(LONG_PTR)-1)", "::CreateFileW"),
+        openError);
     std::vector<std::uint8_t> buffer;
     const int getError = ZuPlatform::filesGetReparsePoint(hDirMountPoint, buffer);
     if (getError != ZuPlatform::kFilesNotAReparsePoint) {

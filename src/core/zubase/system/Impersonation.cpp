@@ -95,7 +95,7 @@ static RkResult win32TokenGetInformation(void* const inToken, ZuPlatform::TokenI
 {
     RkResult res;
     outData.clear();
-    std::size_t dwSize = 0;
+    std::size_t dwSize = 0; // the size the data needs; the name is part of the record
     int error =
         ZuPlatform::accountsGetTokenInformation(accountToken(inToken), inClass, nullptr, 0, dwSize);
     if (error != 0 && error != ERANGE) {
@@ -185,7 +185,7 @@ QString groupFlagsText(std::uint32_t inAttributes)
         std::uint32_t mask;
         const char* text;
     };
-    static const Flag sFlags[] = {
+    static const Flag kFlags[] = {
         {0x1, " SE_GROUP_MANDATORY"},
         {0x2, " SE_GROUP_ENABLED_BY_DEFAULT"},
         {0x4, " SE_GROUP_ENABLED"},
@@ -197,7 +197,7 @@ QString groupFlagsText(std::uint32_t inAttributes)
         {0x20000000, " SE_GROUP_RESOURCE"},
     };
     QString text;
-    for (const Flag& flag : sFlags) {
+    for (const Flag& flag : kFlags) {
         if (inAttributes & flag.mask)
             text += QLatin1String(flag.text);
     }
