@@ -65,15 +65,12 @@ std::string escapedControls(const std::string& inText)
     return text;
 }
 
-// Says once per process on standard error why a setting of the environment is not used.
-void complainOnce(std::atomic<bool>& ioSaid, const std::string& inText)
+// Says on standard error why a setting of the environment is not used; the log reads the
+// environment once, when it is made.
+void complain(const std::string& inText)
 {
-    if (!ioSaid.exchange(true))
-        std::fprintf(stderr, "zubase: %s\n", inText.c_str());
+    std::fprintf(stderr, "zubase: %s\n", inText.c_str());
 }
-
-std::atomic<bool> sLevelComplaint{false};
-std::atomic<bool> sFileComplaint{false};
 
 } // namespace
 
@@ -103,14 +100,13 @@ RkLogFile::RkLogFile() : d(new Private)
         if (errno == 0 && *end == '\0' && value >= RkLogDebug && value <= RkLogOff)
             d->outputLevel = RkLogLevel(value);
         else
-            complainOnce(sLevelComplaint, std::string("ZUBASE_LOG_LEVEL \"") + level +
-                                              "\" is no level from 0 to 5; the log keeps level 1");
+            complain(std::string("ZUBASE_LOG_LEVEL \"") + level +
+                     "\" is no level from 0 to 5; the log keeps level 1");
     }
     if (const char* path = std::getenv("ZUBASE_LOG_FILE"); path && *path) {
         if (!setOutputFile(path))
-            complainOnce(sFileComplaint, std::string("cannot open ZUBASE_LOG_FILE \"") + path +
-                                             "\" (" + std::strerror(errno) +
-                                             "); the log goes to standard error");
+            complain(std::string("cannot open ZUBASE_LOG_FILE \"") + path + "\" (" +
+                     std::strerror(errno) + "); the log goes to standard error");
     }
 }
 

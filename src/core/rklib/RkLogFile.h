@@ -35,7 +35,8 @@ struct RkLogEntry
 // "<time> [<thread>] <level letter> <category>: <text>" (no category: "... <level letter> <text>")
 // to stderr, or to the file named by ZUBASE_LOG_FILE. ZUBASE_LOG_LEVEL (0..5, default 1) is the
 // lowest level written there; a value that is no level, or a file that cannot be opened, is
-// said once on stderr and the default kept. Control characters are written there as C escapes
+// said on stderr when the log is made, and the default kept. Control characters are written there
+// as C escapes
 // ("\n", "\x1b"), tabs as they are, so one call stays one line. Sinks (RkLogCapture in tests)
 // and the write callback see every entry with its text as it was given.
 class RKLIB_EXPORT RkLogFile
