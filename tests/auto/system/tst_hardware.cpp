@@ -1,31 +1,21 @@
-// Machine information: the DMI tool's output and its start, disk space of real paths, and the
-// peer names of real connections.
+// Machine information: the DMI tool's output and its start, and disk space of real paths.
 #include "TestSupport.h"
 #include "zubase/Hardware.h"
 #include "zubase/system/Hardware_p.h"
-#include "zubase/ZuNetwork.h"
 
-#include <QCoreApplication>
 #include <QDir>
 #include <QFile>
 #include <QProcess>
-#include <QTcpServer>
-#include <QTcpSocket>
 #include <QTemporaryDir>
 #include <QtTest>
 
-#include <cerrno>
-#include <sys/socket.h>
 #include <sys/statvfs.h>
-#include <unistd.h>
 
 using TestSupport::logLines;
 
 namespace {
 
-const QString sSample =
-    QStringLiteral(ZUBASE_TEST_DATA_DIR "/files/dmidecode/desktop-ami-2007.txt");
-const QString sProbe = QStringLiteral(ZUBASE_TEST_HELPER_DIR "/zubase_hwprobe");
+const QString kSample = TestSupport::dataPath("files/dmidecode/desktop-ami-2007.txt");
 
 // A fake DMI tool: prints the given file for exactly "-q", complains otherwise. A file name
 // behind "hang:" is printed and the tool then does not end.
@@ -52,7 +42,7 @@ class TestHardware : public QObject
 {
     Q_OBJECT
 
-private slots:
+private Q_SLOTS:
     void parseDmiDecodeOutput_data();
     void parseDmiDecodeOutput();
     void hardwareTypeFromTool_data();
@@ -61,10 +51,6 @@ private slots:
     void diskSpaceArithmetic();
     void diskFreeSpaceOfRealPath();
     void diskFreeSpaceOfMissingPath();
-    void peerName_data();
-    void peerName();
-    void peerNameFailure_data();
-    void peerNameFailure();
 };
 
 void TestHardware::parseDmiDecodeOutput_data()
@@ -76,7 +62,7 @@ void TestHardware::parseDmiDecodeOutput_data()
                         const QString& inSerial, const QString& inBios) {
         QTest::newRow(inName) << inOutput << QStringList{inProduct, inSerial, inBios};
     };
-    QFile sample(sSample);
+    QFile sample(kSample);
     QVERIFY(sample.open(QIODevice::ReadOnly));
     row("real desktop output", sample.readAll(), "P4M900T-M2", "00000000",
         "American Megatrends Inc., 080014, 12/17/2007");
@@ -123,10 +109,10 @@ void TestHardware::hardwareTypeFromTool_data()
 
     const QStringList real{"P4M900T-M2", "00000000",
                            "American Megatrends Inc., 080014, 12/17/2007"};
-    QTest::newRow("dmidecode") << QStringList{"dmidecode", sSample} << real;
+    QTest::newRow("dmidecode") << QStringList{"dmidecode", kSample} << real;
     QTest::newRow("dmidecode.exe first")
-        << QStringList{"dmidecode.exe", sSample, "dmidecode", "/dev/null"} << real;
-    QTest::newRow("tool that does not end") << QStringList{"dmidecode", "hang:" + sSample} << real;
+        << QStringList{"dmidecode.exe", kSample, "dmidecode", "/dev/null"} << real;
+    QTest::newRow("tool that does not end") << QStringList{"dmidecode", "hang:" + kSample} << real;
     QTest::newRow("no tool") << QStringList() << QStringList{"N/A", "N/A", "N/A"};
     QTest::newRow("tool prints binary garbage")
         << QStringList{"dmidecode", "/bin/sh"} << QStringList{"N/A", "N/A", "N/A"};
@@ -141,7 +127,7 @@ void TestHardware::hardwareTypeFromTool()
     QTemporaryDir root;
     const QString appDir = root.filePath("Tessel App/bin dir");
     QVERIFY(QDir().mkpath(appDir));
-    QVERIFY(QFile::copy(sProbe, appDir + "/probe"));
+    QVERIFY(QFile::copy(TestSupport::helper("zubase_hwprobe"), appDir + "/probe"));
     QFile(appDir + "/probe").setPermissions(QFile::ReadOwner | QFile::ExeOwner);
     for (int i = 0; i + 1 < tools.size(); i += 2)
         writeTool(appDir + '/' + tools.at(i), tools.at(i + 1));
@@ -165,6 +151,7 @@ void TestHardware::diskSpaceArithmetic_data()
     QTest::newRow("empty volume") << quint64(0) << quint64(0) << 0u << 0.0;
     QTest::newRow("1.5 GiB free of 3") << 3 * GiB / 2 << 3 * GiB << 1536u << 50.0;
     QTest::newRow("rounded down") << (quint64(1) << 20) - 1 << GiB << 0u << 99.90234;
+    QTest::newRow("one byte, in use") << quint64(0) << quint64(1) << 0u << 50.0;
     QTest::newRow("8 TiB free") << 8192 * GiB << 8192 * GiB << 8388608u << 0.0;
 }
 
@@ -195,7 +182,7 @@ void TestHardware::diskFreeSpaceOfRealPath()
     RkLogCapture capture;
     unsigned int freeMB = 0;
     float usedPercent = 0;
-    QVERIFY(ZuBase::getDiskFreeSpaceMB(dir.path(), freeMB, usedPercent).isOk());
+    QVERIFY_OK(ZuBase::getDiskFreeSpaceMB(dir.path(), freeMB, usedPercent));
     QCOMPARE(logLines(capture, "Tz"), QStringList());
     // Other programs write to the same disk meanwhile; allow them some room.
     QVERIFY2(qAbs(freeMB - expectedFreeMB) < 256, qPrintable(QString::number(freeMB)));
@@ -217,70 +204,6 @@ void TestHardware::diskFreeSpaceOfMissingPath()
                           "::GetDiskFreeSpaceEx() [/no/such/path]  cond[ret]",
                           "last error 2: No such file or directory"}));
     QVERIFY(ZuBase::getDiskFreeSpaceMB(QString(), freeMB, usedPercent).isBad());
-}
-
-void TestHardware::peerName_data()
-{
-    QTest::addColumn<int>("listenOn"); // QHostAddress::SpecialAddress
-    QTest::addColumn<QString>("connectTo");
-    QTest::addColumn<int>("acceptedFamily");
-
-    QTest::newRow("IPv4") << int(QHostAddress::LocalHost) << "127.0.0.1" << int(AF_INET);
-    QTest::newRow("IPv6") << int(QHostAddress::LocalHostIPv6) << "::1" << int(AF_INET6);
-    // An IPv4 client of a dual-stack server arrives as ::ffff:127.0.0.1.
-    QTest::newRow("IPv4-mapped IPv6") << int(QHostAddress::Any) << "127.0.0.1" << int(AF_INET6);
-}
-
-void TestHardware::peerName()
-{
-    QFETCH(int, listenOn);
-    const QHostAddress address(static_cast<QHostAddress::SpecialAddress>(listenOn));
-    QFETCH(QString, connectTo);
-    QFETCH(int, acceptedFamily);
-
-    QTcpServer server;
-    if (!server.listen(address))
-        QSKIP(qPrintable("cannot listen on " + address.toString() + ": " + server.errorString()));
-    QTcpSocket client;
-    client.connectToHost(QHostAddress(connectTo), server.serverPort());
-    QVERIFY(client.waitForConnected(10000));
-    QVERIFY(server.waitForNewConnection(10000));
-    QTcpSocket* accepted = server.nextPendingConnection();
-    QVERIFY(accepted);
-    const int fd = int(accepted->socketDescriptor());
-    sockaddr_storage own{};
-    socklen_t length = sizeof own;
-    QCOMPARE(::getsockname(fd, reinterpret_cast<sockaddr*>(&own), &length), 0);
-    QCOMPARE(int(own.ss_family), acceptedFamily);
-
-    RkLogCapture capture;
-    QCOMPARE(ZuNetwork::getPeerName(fd), connectTo);
-    QCOMPARE(ZuNetwork::getPeerName(int(client.socketDescriptor())), connectTo);
-    QCOMPARE(logLines(capture), QStringList());
-}
-
-void TestHardware::peerNameFailure_data()
-{
-    QTest::addColumn<QString>("socket");
-    QTest::addColumn<QString>("line");
-    QTest::newRow("closed descriptor") << "invalid"
-                                       << "getpeername() failed: Bad file descriptor";
-    QTest::newRow("not connected") << "unconnected"
-                                   << "getpeername() failed: Transport endpoint is not connected";
-}
-
-void TestHardware::peerNameFailure()
-{
-    QFETCH(QString, socket);
-    QFETCH(QString, line);
-    const int fd = socket == "unconnected" ? ::socket(AF_INET, SOCK_STREAM, 0) : 9999; // not open
-    RkLogCapture capture;
-    QCOMPARE(ZuNetwork::getPeerName(fd), QString());
-    if (fd != 9999)
-        ::close(fd);
-    // One error line without a category.
-    QCOMPARE(logLines(capture), QStringList{line});
-    QCOMPARE(logLines(capture, "", RkLogError), QStringList{line});
 }
 
 QTEST_GUILESS_MAIN(TestHardware)

@@ -1,0 +1,349 @@
+// Failure records, their reporting and the log they go to.
+#include "TestSupport.h"
+
+#include "rklib/RkCheck.h"
+#include "rklib/RkLogFile.h"
+#include "rklib/Tz.h"
+
+#include <QDir>
+#include <QTemporaryDir>
+#include <QtTest>
+
+#include <cerrno>
+#include <set>
+#include <thread>
+
+#include <fcntl.h>
+#include <unistd.h>
+
+namespace Family {
+struct Widget
+{
+    static RkResult check(int inValue)
+    {
+        return RK_CHECK(inValue > 0, "inValue>0", "Internal Error");
+    }
+    static RkResult equal(int inValue) { return RK_CHECK_EQ(inValue, 1, QStringLiteral("count")); }
+    static RkResult differ(const QString& inValue)
+    {
+        return RK_CHECK_NE(inValue, QStringLiteral("x"), "must not be x");
+    }
+};
+} // namespace Family
+
+namespace {
+
+// "ok" or "bad", then the records with a source line as "(#)".
+QString described(const RkResult& inResult)
+{
+    return QString(inResult.isBad() ? "bad " : "ok ") +
+           QString::fromStdString(inResult.toString())
+               .replace(QRegularExpression(R"(\([1-9]\d*\))"), "(#)");
+}
+
+std::vector<std::pair<RkLogLevel, std::string>> sCallbackLines;
+void recordCallback(RkLogLevel inLevel, const RkString& inText)
+{
+    sCallbackLines.emplace_back(inLevel, inText.str());
+}
+
+// Runs inWork with standard error going to a file and gives what was written there.
+template <typename Work> QStringList standardError(const QString& inFile, Work inWork)
+{
+    std::fflush(stderr);
+    const int saved = dup(STDERR_FILENO);
+    QFile file(inFile);
+    if (!file.open(QIODevice::WriteOnly))
+        return {"cannot open " + inFile};
+    dup2(file.handle(), STDERR_FILENO);
+    inWork();
+    std::fflush(stderr);
+    dup2(saved, STDERR_FILENO);
+    close(saved);
+    file.close();
+    file.open(QIODevice::ReadOnly);
+    return QString::fromUtf8(file.readAll()).split('\n', Qt::SkipEmptyParts);
+}
+
+} // namespace
+
+class TestRkLog : public QObject
+{
+    Q_OBJECT
+
+private Q_SLOTS:
+    void checkRecords_data();
+    void checkRecords();
+    void qualifiedFunctionName_data();
+    void qualifiedFunctionName();
+    void reporting();
+    void writeCallbackLevelsAndDisabler();
+    void captureAndSinks();
+    void logFromManyThreadsKeepsLines();
+    void logLevelFromEnvironment_data();
+    void logLevelFromEnvironment();
+    void logFileFromEnvironment();
+};
+
+void TestRkLog::checkRecords_data()
+{
+    QTest::addColumn<QString>("result");
+    QTest::addColumn<QString>("expected");
+    const QString where = "tst_rklog:Family::Widget::";
+    QTest::newRow("cond holds") << described(Family::Widget::check(3)) << "ok ";
+    QTest::newRow("cond fails") << described(Family::Widget::check(-3))
+                                << "bad " + where + "check(#): Internal Error  cond[inValue>0]";
+    QTest::newRow("eq holds") << described(Family::Widget::equal(1)) << "ok ";
+    QTest::newRow("eq fails") << described(Family::Widget::equal(7))
+                              << "bad " + where + "equal(#): count  val[7]  exp[1]";
+    QTest::newRow("ne holds") << described(Family::Widget::differ("y")) << "ok ";
+    QTest::newRow("ne fails") << described(Family::Widget::differ("x"))
+                              << "bad " + where + "differ(#): must not be x  val[x]  notexp[x]";
+
+    // Accumulated records travel in order; a result made bad carries none.
+    RkResult res;
+    res << RkResult();
+    res << RkResult(RkResult::Error, 10, "a:f", "first", "cond[a]");
+    res << RkResult(RkResult::Warning, 20, "b:g", "second", "cond[b]");
+    QTest::newRow("accumulated") << described(res)
+                                 << "bad a:f(#): first  cond[a]\nb:g(#): second  cond[b]";
+    RkResult warning(RkResult::Warning, 5, "w", "m", "d");
+    QTest::newRow("warning only") << described(warning) << "ok w(#): m  d";
+    warning << warning;
+    QTest::newRow("appended to itself") << described(warning) << "ok w(#): m  d\nw(#): m  d";
+    RkResult made;
+    made.makeBad(1);
+    QTest::newRow("made bad") << described(made) << "bad ";
+    QTest::newRow("two texts") << described(RkResult(RkResult::Error, "", "")) << "bad (0):   ";
+}
+
+void TestRkLog::checkRecords()
+{
+    QFETCH(QString, result);
+    QFETCH(QString, expected);
+    QCOMPARE(result, expected);
+
+    // The message is only built for a failure.
+    int built = 0;
+    auto message = [&built]() {
+        ++built;
+        return std::string("m");
+    };
+    const int one = 1;
+    QVERIFY(RK_CHECK(one == 1, "one==1", message()).isOk());
+    QVERIFY(RK_CHECK_EQ(one, 1, message()).isOk());
+    QVERIFY(RK_CHECK_NE(one, 1, message()).isBad());
+    QCOMPARE(built, 1);
+}
+
+void TestRkLog::qualifiedFunctionName_data()
+{
+    QTest::addColumn<QString>("pretty");
+    QTest::addColumn<QString>("name");
+    const auto row = [](const char* inRow, const char* inPretty, const char* inName) {
+        QTest::newRow(inRow) << inPretty << inName;
+    };
+    row("static member",
+        "static RkResult ZuBase::Command::create(RkHandle<ZuBase::Command>&, const QString&)",
+        "ZuBase::Command::create");
+    row("template return", "QMap<QString, int> Zu::Foo::bar(int)", "Zu::Foo::bar");
+    row("constructor", "ZuBase::Pipe::Pipe(const QString&)", "ZuBase::Pipe::Pipe");
+    row("operator call", "bool Zu::Less::operator()(int) const", "Zu::Less::operator()");
+    row("operator less", "bool Zu::Key::operator<(const Zu::Key&) const", "Zu::Key::operator<");
+    row("operator at the start", "operator bool()", "operator bool");
+    row("lambda inside", "ZuBase::Process::start(bool)::<lambda()>", "ZuBase::Process::start");
+    row("pointer at the name", "char *ZuX::name() const", "ZuX::name");
+    row("reference at the name", "int &ZuX::at(int)", "ZuX::at");
+    row("no parameter list", "ZuX::value", "ZuX::value");
+}
+
+void TestRkLog::qualifiedFunctionName()
+{
+    QFETCH(QString, pretty);
+    QFETCH(QString, name);
+    QCOMPARE(QString::fromStdString(Rk::qualifiedFunctionName(pretty.toUtf8().constData())), name);
+    // Family folders and any prefix before src/ are not part of the where text.
+    QCOMPARE(Rk::sourceFamily("/work/x/src/core/zubase/File.cpp"),
+             std::string("src/core/zubase/File"));
+    QCOMPARE(Rk::sourceFamily("../../src/core/zubase/system/Pipe.cpp"),
+             std::string("src/core/zubase/Pipe"));
+    QCOMPARE(Rk::sourceFamily("C:\\b\\tests\\tst_x.cpp"), std::string("tst_x"));
+}
+
+void TestRkLog::reporting()
+{
+    RkLogCapture capture;
+    QVERIFY(!Tz::fail(RkResult()));
+    QVERIFY(!Tz::failWin(RkResult(), EIO));
+    QVERIFY(capture.entries().empty());
+
+    RkResult res(RkResult::Error, 12, "src/core/zubase/File:ZuBase::File::readAll",
+                 "Internal Error", "cond[file.exists()]");
+    res << RkResult(RkResult::Error, 13, "w", "m", "d");
+    QVERIFY(Tz::fail(res));
+    errno = ENOENT;
+    QVERIFY(Tz::failWin(RkResult(RkResult::Error, 5, "w", "::ReadFile", "cond[bret]")));
+    QVERIFY(!Tz::logWinFunc(1, 1, "::RevertToSelf", nullptr, true));
+    QVERIFY(!Tz::logWinFunc(1, 1, "::GetTokenInformation", "", false));
+    QVERIFY(Tz::logWinFunc(0, 1, "::LogonUser", "user", true, EACCES));
+    QCOMPARE(capture.lines(),
+             std::vector<std::string>(
+                 {"E Tz: src/core/zubase/File:ZuBase::File::readAll(12): Internal Error  "
+                  "cond[file.exists()]",
+                  "E Tz: w(13): m  d", "E Tz: w(5): ::ReadFile  cond[bret]",
+                  "E Tz: last error 2: No such file or directory", "I Tz: ::RevertToSelf -> ok",
+                  "D Tz: ::GetTokenInformation -> ok",
+                  "E Tz: ::LogonUser user -> 0, last error 13: Permission denied"}));
+}
+
+void TestRkLog::writeCallbackLevelsAndDisabler()
+{
+    sCallbackLines.clear();
+    RkLogFile& log = getTheLogInstance();
+    log.setWriteCallback(&recordCallback, RkLogWarning);
+    log.tracef(RkLogInfo, "T", "info %d", 1);
+    log.warnf("warn %s", "x");
+    {
+        RkLogFileWriteCallbackDisabler disabler;
+        disabler.disableWriteCallback();
+        disabler.disableWriteCallback(); // once is enough to restore
+        log.errorf("hidden");
+        // Another thread is not affected by this thread's disabler.
+        std::thread([&log] { log.errorf("other thread"); }).join();
+        disabler.restoreWriteCallback();
+        log.errorf("shown");
+        disabler.disableWriteCallback();
+    } // restored by the destructor
+    log.print("C", "after scope");
+    log.tracef(RkLogFatal, "C", "fatal");
+    log.setWriteCallback(nullptr, RkLogOff);
+    log.errorf("removed");
+    const std::vector<std::pair<RkLogLevel, std::string>> expected = {{RkLogWarning, "warn x"},
+                                                                      {RkLogError, "other thread"},
+                                                                      {RkLogError, "shown"},
+                                                                      {RkLogFatal, "fatal"}};
+    QCOMPARE(sCallbackLines, expected);
+}
+
+void TestRkLog::captureAndSinks()
+{
+    RkLogCapture capture;
+    RkLogFile& log = getTheLogInstance();
+    const std::string longText(700, 'y'); // longer than the first formatting buffer
+    log.printf("%s|", longText.c_str());
+    log.print("ZuBase", "a\nb");
+    log.errorf("plain %d", 3);
+    QCOMPARE(capture.texts(), std::vector<std::string>({longText + "|", "a\nb", "plain 3"}));
+    QCOMPARE(capture.texts("ZuBase"), std::vector<std::string>({"a\nb"}));
+    QCOMPARE(capture.lines(),
+             std::vector<std::string>({"I " + longText + "|", "I ZuBase: a\\nb", "E plain 3"}));
+    QCOMPARE(capture.entries().at(2).thread, long(gettid()));
+    capture.clear();
+    QVERIFY(capture.entries().empty());
+
+    // A removed sink is not called again.
+    int calls = 0;
+    const int sink = log.addSink([&calls](const RkLogEntry&) { ++calls; });
+    log.printf("one");
+    log.removeSink(sink);
+    log.printf("two");
+    QCOMPARE(calls, 1);
+    QCOMPARE(capture.texts().size(), std::size_t(2));
+}
+
+void TestRkLog::logFromManyThreadsKeepsLines()
+{
+    RkLogCapture capture;
+    std::vector<std::thread> threads;
+    for (int t = 0; t < 4; ++t) {
+        threads.emplace_back([t] {
+            for (int i = 0; i < 250; ++i)
+                getTheLogInstance().tracef(RkLogDebug, "Stress", "t%d line %d", t, i);
+        });
+    }
+    for (auto& thread : threads)
+        thread.join();
+    const auto texts = capture.texts("Stress");
+    QCOMPARE(std::set<std::string>(texts.begin(), texts.end()).size(), std::size_t(1000));
+}
+
+void TestRkLog::logLevelFromEnvironment_data()
+{
+    QTest::addColumn<QByteArray>("value");
+    QTest::addColumn<int>("level");
+    QTest::addColumn<bool>("said"); // on standard error
+    QTest::newRow("debug") << QByteArray("0") << int(RkLogDebug) << false;
+    QTest::newRow("warning") << QByteArray("2") << int(RkLogWarning) << false;
+    QTest::newRow("off") << QByteArray("5") << int(RkLogOff) << false;
+    QTest::newRow("unset") << QByteArray() << int(RkLogInfo) << false;
+    QTest::newRow("below") << QByteArray("-1") << int(RkLogInfo) << true;
+    QTest::newRow("above") << QByteArray("6") << int(RkLogInfo) << true;
+    QTest::newRow("no number") << QByteArray("verbose") << int(RkLogInfo) << true;
+}
+
+void TestRkLog::logLevelFromEnvironment()
+{
+    QFETCH(QByteArray, value);
+    QFETCH(int, level);
+    QFETCH(bool, said);
+    QTemporaryDir dir;
+    qputenv("ZUBASE_LOG_LEVEL", value);
+    RkLogLevel read = RkLogFatal;
+    const QStringList errors =
+        standardError(dir.filePath("stderr"), [&read] { read = RkLogFile().outputLevel(); });
+    qunsetenv("ZUBASE_LOG_LEVEL");
+    QCOMPARE(int(read), level);
+    QCOMPARE(errors.size(), int(said));
+}
+
+void TestRkLog::logFileFromEnvironment()
+{
+    // A file and a level from the environment; one call is one line, whatever the text holds.
+    QTemporaryDir dir;
+    const QString path = dir.filePath("log.txt");
+    qputenv("ZUBASE_LOG_FILE", path.toLocal8Bit());
+    qputenv("ZUBASE_LOG_LEVEL", "2");
+    bool closedOnExec = false;
+    {
+        RkLogFile log;
+        log.printf("not written");
+        log.tracef(RkLogWarning, "ZuBase", "value [%s]", "a\nE Tz: forged\r\x1b[2J\tb");
+        // The children the library starts must not inherit the log file.
+        for (const QFileInfo& fd : QDir("/proc/self/fd").entryInfoList(QDir::Files | QDir::System))
+            if (fd.symLinkTarget() == path)
+                closedOnExec = fcntl(fd.fileName().toInt(), F_GETFD) & FD_CLOEXEC;
+    }
+    QVERIFY(closedOnExec);
+    QFile file(path);
+    QVERIFY(file.open(QIODevice::ReadOnly));
+    const QStringList lines = QString::fromUtf8(file.readAll()).split('\n', Qt::SkipEmptyParts);
+    QCOMPARE(lines.size(), 1);
+    QVERIFY2(QRegularExpression(R"(^\d{4}-\d\d-\d\d \d\d:\d\d:\d\d\.\d{3} \[\d+\] W ZuBase: )"
+                                R"(value \[a\\nE Tz: forged\\r\\x1b\[2J\tb\]$)")
+                 .match(lines[0])
+                 .hasMatch(),
+             qPrintable(lines[0]));
+
+    // What cannot be used is said on standard error when the log is made; the defaults stay.
+    const QString missing = dir.filePath("missing/log.txt");
+    qputenv("ZUBASE_LOG_FILE", missing.toLocal8Bit());
+    qputenv("ZUBASE_LOG_LEVEL", "1x");
+    RkLogLevel level = RkLogOff;
+    const QStringList said = standardError(dir.filePath("stderr"), [&level] {
+        RkLogFile log;
+        level = log.outputLevel();
+        log.printf("to standard error");
+    });
+    qunsetenv("ZUBASE_LOG_FILE");
+    qunsetenv("ZUBASE_LOG_LEVEL");
+    QCOMPARE(level, RkLogInfo);
+    QCOMPARE(said.size(), 3);
+    QCOMPARE(said[0], "zubase: ZUBASE_LOG_LEVEL \"1x\" is no level from 0 to 5; the log keeps "
+                      "level 1");
+    QCOMPARE(said[1], "zubase: cannot open ZUBASE_LOG_FILE \"" + missing +
+                          "\" (No such file or directory); the log goes to standard error");
+    QVERIFY(said[2].endsWith(" I to standard error"));
+}
+
+QTEST_GUILESS_MAIN(TestRkLog)
+#include "tst_rklog.moc"
