@@ -1,5 +1,5 @@
-// Named pipes: transfers between processes, the connection states, failures of a peer that goes
-// away, one instance per name, a peer that is not ours, copies and the serving thread.
+// Named pipes: transfers between processes, the connection states, a peer that goes away, one
+// instance per name, socket names, a peer that is not ours, copies and the serving thread.
 #include "TestSupport.h"
 
 #include "zubase/Pipe.h"
@@ -13,18 +13,18 @@
 #include <QUuid>
 #include <QtTest>
 
-#include <algorithm>
 #include <memory>
 #include <thread>
 
+#include <sys/stat.h>
 #include <unistd.h>
 
 using TestSupport::failureLines;
 
 namespace {
 
-const QString sPeer = TestSupport::helper("zu_pipe_peer");
-const QString sWhere = QStringLiteral("src/core/zubase/Pipe:ZuBase::Pipe::");
+const QString kPeer = TestSupport::helper("zu_pipe_peer");
+const QString kWhere = QStringLiteral("src/core/zubase/Pipe:ZuBase::Pipe::");
 
 // The bytes zu_pipe_peer sends and expects.
 QByteArray pattern(int inSize)
@@ -37,7 +37,7 @@ QByteArray pattern(int inSize)
 
 QString uniqueName()
 {
-    return QStringLiteral("zutest-") + QUuid::createUuid().toString(QUuid::WithoutBraces);
+    return "zutest-" + QUuid::createUuid().toString(QUuid::WithoutBraces);
 }
 
 QString socketPath(const QString& inName)
@@ -74,7 +74,7 @@ class TestPipe : public QObject
 {
     Q_OBJECT
 
-private slots:
+private Q_SLOTS:
     void transferAcrossProcesses_data();
     void transferAcrossProcesses();
     void peerDiesMidTransfer_data();
@@ -86,6 +86,7 @@ private slots:
     void socketNames();
     void foreignPeerReadsStream();
     void copiesShareOneHandle();
+    void closeEndsABlockedAccept();
     void pipeServerAcceptsAndPaces();
 };
 
@@ -95,8 +96,6 @@ void TestPipe::transferAcrossProcesses_data()
     QTest::addColumn<int>("size");
     QTest::addColumn<int>("piece"); // the peer server's writes, 0: one
     QTest::newRow("to client: 1") << true << 1 << 0;
-    QTest::newRow("to client: 100") << true << 100 << 0;
-    QTest::newRow("to client: 65537") << true << 65537 << 0;
     QTest::newRow("to client: 3 MiB + 11") << true << 3 * 1024 * 1024 + 11 << 0;
     QTest::newRow("from server: 100 in 60 and 40") << false << 100 << 60;
     QTest::newRow("from server: odd size, one write") << false << 1000003 << 0;
@@ -117,23 +116,22 @@ void TestPipe::transferAcrossProcesses()
     pipe.nameSet(name);
     QProcess peer;
     if (serverHere) {
-        QVERIFY(pipe.createOnServer().isOk());
-        peer.start(sPeer, args);
+        QVERIFY_OK(pipe.createOnServer());
+        peer.start(kPeer, args);
         RkLogCapture capture;
-        QVERIFY(pipe.acceptOnServer().isOk());
+        QVERIFY_OK(pipe.acceptOnServer());
         QVERIFY(pipe.isConnected());
         QCOMPARE(capture.texts(),
                  std::vector<std::string>(
                      {"::ConnectNamedPipe() [" + name.toStdString() + "]", "pipeConnected"}));
-        const QByteArray data = pattern(size);
-        QVERIFY(pipe.write(data.constData(), unsigned(size)).isOk());
+        QVERIFY_OK(pipe.write(pattern(size).constData(), unsigned(size)));
     } else {
-        peer.start(sPeer, args);
-        QVERIFY(pipe.connectOnClient().isOk());
-        QVERIFY(pipe.isConnected());
+        peer.start(kPeer, args);
+        QVERIFY_OK(pipe.connectOnClient());
+        QVERIFY(pipe.isConnected() && pipe.isClient() && !pipe.isServer());
         QByteArray got(size, '\0');
-        QVERIFY(pipe.read(got.data(), 0).isOk());
-        QVERIFY(pipe.read(got.data(), unsigned(size)).isOk());
+        QVERIFY_OK(pipe.read(got.data(), 0));
+        QVERIFY_OK(pipe.read(got.data(), unsigned(size)));
         QCOMPARE(got, pattern(size));
         pipe.close();
     }
@@ -159,21 +157,21 @@ void TestPipe::peerDiesMidTransfer()
     QProcess peer;
     RkLogCapture capture;
     if (serverHere) {
-        QVERIFY(pipe.createOnServer().isOk());
-        peer.start(sPeer, {"client-die", name, "1000"});
-        QVERIFY(pipe.acceptOnServer().isOk());
+        QVERIFY_OK(pipe.createOnServer());
+        peer.start(kPeer, {"client-die", name, "1000"});
+        QVERIFY_OK(pipe.acceptOnServer());
         const QByteArray data = pattern(8 * 1024 * 1024); // far more than the socket holds
         QVERIFY(pipe.write(data.constData(), unsigned(data.size())).isBad());
-        QCOMPARE(failureLines(capture).value(0), sWhere + "write: ::WriteFile  cond[b]");
+        QCOMPARE(failureLines(capture).value(0), kWhere + "write: ::WriteFile  cond[b]");
         QVERIFY(failureLines(capture).value(1).startsWith("last error "));
     } else {
-        peer.start(sPeer, {"server-die", name, "1000"});
-        QVERIFY(pipe.connectOnClient().isOk());
+        peer.start(kPeer, {"server-die", name, "1000"});
+        QVERIFY_OK(pipe.connectOnClient());
         QByteArray got(5000, '\0');
         QVERIFY(pipe.read(got.data(), 5000).isBad());
         QCOMPARE(got.left(1000), pattern(1000)); // what came before stays
         QCOMPARE(failureLines(capture),
-                 QStringList({sWhere + "read: ::ReadFile  cond[b]", "last error 32: Broken pipe"}));
+                 QStringList({kWhere + "read: ::ReadFile  cond[b]", "last error 32: Broken pipe"}));
     }
     QVERIFY(peer.waitForFinished(5000));
     pipe.close();
@@ -181,7 +179,7 @@ void TestPipe::peerDiesMidTransfer()
     // removes them when it closes.
     ZuBase::Pipe next(true);
     next.nameSet(name);
-    QVERIFY(next.createOnServer().isOk());
+    QVERIFY_OK(next.createOnServer());
     next.close();
     QVERIFY(!QFile::exists(socketPath(name)));
     QVERIFY(!QFile::exists(socketPath(name).replace(".pipe", ".lock")));
@@ -190,7 +188,7 @@ void TestPipe::peerDiesMidTransfer()
 void TestPipe::acceptStates()
 {
     Ends ends;
-    QVERIFY(ends.server.createOnServer().isOk());
+    QVERIFY_OK(ends.server.createOnServer());
     // No client: a bad result after the time-out, and nothing left pending.
     RkLogCapture capture;
     QElapsedTimer timer;
@@ -200,13 +198,13 @@ void TestPipe::acceptStates()
     QVERIFY(!ends.server.isConnected());
     QCOMPARE(capture.texts(),
              std::vector<std::string>{"::ConnectNamedPipe() [" + ends.name.toStdString() + "]"});
-    // A client that connects before the next pass counts as connected.
-    QVERIFY(ends.client.connectOnClient().isOk());
-    QVERIFY(ends.server.acceptOnServer().isOk());
+    // A client that connects before the next pass counts as connected; further passes find it
+    // connected at once.
+    QVERIFY_OK(ends.client.connectOnClient());
+    QVERIFY_OK(ends.server.acceptOnServer());
     QVERIFY(ends.server.isConnected());
     QVERIFY(passes(ends.server, ends.client, "hello"));
-    // Further passes find the client connected at once.
-    QVERIFY(ends.server.acceptOnServer().isOk());
+    QVERIFY_OK(ends.server.acceptOnServer());
     // After the client has gone the pipe cannot be used again: accepting fails at once.
     ends.client.close();
     capture.clear();
@@ -220,10 +218,10 @@ void TestPipe::acceptStates()
 void TestPipe::oneInstanceAndReadOnlyClient()
 {
     Ends ends;
-    QVERIFY(ends.server.createOnServer().isOk());
+    QVERIFY_OK(ends.server.createOnServer());
     // Creating again replaces our own server end instead of competing with it.
-    QVERIFY(ends.server.createOnServer().isOk());
-    QVERIFY(ends.client.connectOnClient().isOk());
+    QVERIFY_OK(ends.server.createOnServer());
+    QVERIFY_OK(ends.client.connectOnClient());
     RkLogCapture capture;
     // A second client finds the one instance taken at once, before and after the accept.
     ZuBase::Pipe secondServer(true), secondClient(false);
@@ -233,62 +231,57 @@ void TestPipe::oneInstanceAndReadOnlyClient()
     timer.start();
     QVERIFY(secondClient.connectOnClient().isBad());
     QVERIFY(timer.elapsed() < 1000);
-    QVERIFY(ends.server.acceptOnServer().isOk());
+    QVERIFY_OK(ends.server.acceptOnServer());
     QVERIFY(secondClient.connectOnClient().isBad());
     QVERIFY(!secondClient.isConnected());
     // A second server is refused as well, and the client end cannot write.
     QVERIFY(secondServer.createOnServer().isBad());
     QVERIFY(!secondServer.isCreated());
     QVERIFY(ends.client.write("abc", 3).isBad());
-    const QString busy = sWhere + "connectOnClient: ::CreateFile  val[-1]  notexp[-1]";
+    const QString busy = kWhere + "connectOnClient: ::CreateFile  val[-1]  notexp[-1]";
     QCOMPARE(
         failureLines(capture),
         QStringList({busy, "last error 16: Device or resource busy", busy,
                      "last error 16: Device or resource busy",
-                     sWhere + "createOnServer: ::CreateNamedPipe  val[-1]  notexp[-1]",
+                     kWhere + "createOnServer: ::CreateNamedPipe  val[-1]  notexp[-1]",
                      "last error 98: Address already in use",
-                     sWhere + "write: ::WriteFile  cond[b]", "last error 9: Bad file descriptor"}));
-    // None of that disturbs the connected pair.
+                     kWhere + "write: ::WriteFile  cond[b]", "last error 9: Bad file descriptor"}));
+    // None of that disturbs the connected pair; once the server has closed, the name is free.
     QVERIFY(passes(ends.server, ends.client, "abc"));
-    // Once the first server has closed, the name is free again.
     ends.server.close();
-    QVERIFY(secondServer.createOnServer().isOk());
+    QVERIFY_OK(secondServer.createOnServer());
 }
 
 void TestPipe::privateSocketWithoutLiveServer()
 {
-    // Sockets live in a directory of ours that nobody else may enter.
+    // Sockets live in a folder of ours that nobody else may enter, also after it was opened up.
     Ends ends;
-    const QFileInfo dir(QFileInfo(socketPath(ends.name)).absolutePath());
-    QVERIFY(dir.isDir());
-    QCOMPARE(dir.permissions() & (QFile::ReadGroup | QFile::WriteGroup | QFile::ExeGroup |
-                                  QFile::ReadOther | QFile::WriteOther | QFile::ExeOther),
-             QFile::Permissions());
-    QCOMPARE(dir.ownerId(), uint(geteuid()));
-    // A server that was killed leaves its socket behind.
+    const QString dir = QFileInfo(socketPath(ends.name)).absolutePath();
+    QCOMPARE(::chmod(QFile::encodeName(dir).constData(), 0755), 0);
     QProcess crashed;
-    crashed.start(sPeer, {"server", ends.name, "10"});
+    crashed.start(kPeer, {"server", ends.name, "10"});
     QTRY_VERIFY(QFile::exists(socketPath(ends.name)));
+    struct stat info;
+    QCOMPARE(::stat(QFile::encodeName(dir).constData(), &info), 0);
+    QCOMPARE(info.st_mode & 0777, 0700u);
+    QCOMPARE(info.st_uid, geteuid());
+    // A server that was killed leaves its socket behind: a client finds no pipe (after the
+    // wait for a server), rather than a busy one ...
     crashed.kill();
     QVERIFY(crashed.waitForFinished(5000));
-    QVERIFY(QFile::exists(socketPath(ends.name)));
-
-    // A client finds no pipe (after the wait for a server), rather than a busy one ...
     RkLogCapture capture;
     QVERIFY(ends.client.connectOnClient().isBad());
-    QVERIFY(!ends.client.isConnected());
-    QVERIFY(!ends.client.isCreated());
+    QVERIFY(!ends.client.isConnected() && !ends.client.isCreated());
     QVERIFY(capture.texts("Tz").empty());
     // ... while a client that waits for a server gets the new one, which takes the name over
     // and removes the socket when it closes.
     RkResult res;
     std::thread connecting([&] { res = ends.client.connectOnClient(); });
     QTest::qWait(300);
-    QVERIFY(ends.server.createOnServer().isOk());
+    QVERIFY_OK(ends.server.createOnServer());
     connecting.join();
-    QVERIFY(res.isOk());
-    QVERIFY(ends.client.isConnected());
-    QVERIFY(ends.server.acceptOnServer().isOk());
+    QVERIFY_OK(res);
+    QVERIFY_OK(ends.server.acceptOnServer());
     ends.server.close();
     QVERIFY(!QFile::exists(socketPath(ends.name)));
 }
@@ -300,14 +293,12 @@ void TestPipe::socketNames_data()
     const QString run = uniqueName();
     const QString longName = run + QString(240, 'y');
     const QByteArray digest =
-        QCryptographicHash::hash(longName.toLocal8Bit(), QCryptographicHash::Sha256)
-            .toHex()
-            .left(32);
+        QCryptographicHash::hash(longName.toLocal8Bit(), QCryptographicHash::Sha256).toHex();
     QTest::newRow("plain") << run + "Plain_1.x" << run + "Plain_1.x.pipe";
     QTest::newRow("escaped") << run + QString::fromUtf8(" a/b\\~\u00fc")
                              << run + "%20a%2Fb%5C%7E%C3%BC.pipe";
     QTest::newRow("too long for a socket path")
-        << longName << "~" + QString::fromLatin1(digest) + ".pipe";
+        << longName << "~" + QString::fromLatin1(digest.left(32)) + ".pipe";
 }
 
 void TestPipe::socketNames()
@@ -317,33 +308,32 @@ void TestPipe::socketNames()
     QCOMPARE(QFileInfo(socketPath(name)).fileName(), file);
     // Usable, and apart from a name that differs only at its end.
     Ends ends(name), other(name + "2");
-    QVERIFY(ends.server.createOnServer().isOk());
-    QVERIFY(other.server.createOnServer().isOk());
-    QVERIFY(ends.client.connectOnClient().isOk());
-    QVERIFY(ends.server.acceptOnServer().isOk());
+    QVERIFY_OK(ends.server.createOnServer());
+    QVERIFY_OK(other.server.createOnServer());
+    QVERIFY_OK(ends.client.connectOnClient());
+    QVERIFY_OK(ends.server.acceptOnServer());
     QVERIFY(passes(ends.server, ends.client, "x"));
 }
 
 void TestPipe::foreignPeerReadsStream()
 {
+    // The stream carries nothing of its own: any reader of the socket gets exactly the bytes.
     const QString socat = QStandardPaths::findExecutable("socat");
     if (socat.isEmpty())
         QSKIP("socat is not installed");
     Ends ends;
-    QVERIFY(ends.server.createOnServer().isOk());
+    QVERIFY_OK(ends.server.createOnServer());
     QTemporaryDir dir;
-    const QString output = dir.filePath("received");
     QProcess reader;
-    reader.start(socat, {"-u", "UNIX-CONNECT:" + socketPath(ends.name), "CREATE:" + output});
-    QVERIFY(reader.waitForStarted());
-    QVERIFY(ends.server.acceptOnServer().isOk());
+    reader.start(socat, {"-u", "UNIX-CONNECT:" + socketPath(ends.name),
+                         "CREATE:" + dir.filePath("received")});
+    QVERIFY_OK(ends.server.acceptOnServer());
     const QByteArray data = pattern(300007);
-    QVERIFY(ends.server.write(data.constData(), 100000).isOk());
-    QVERIFY(ends.server.write(data.constData() + 100000, 200007).isOk());
+    QVERIFY_OK(ends.server.write(data.constData(), 100000));
+    QVERIFY_OK(ends.server.write(data.constData() + 100000, 200007));
     ends.server.close();
     QVERIFY(reader.waitForFinished(10000));
-    QCOMPARE(reader.exitCode(), 0);
-    QFile received(output);
+    QFile received(dir.filePath("received"));
     QVERIFY(received.open(QIODevice::ReadOnly));
     QCOMPARE(received.readAll(), data);
 }
@@ -353,28 +343,43 @@ void TestPipe::copiesShareOneHandle()
     Ends ends;
     auto server = std::make_unique<ZuBase::Pipe>(true);
     server->nameSet(ends.name);
-    QVERIFY(server->createOnServer().isOk());
+    QVERIFY_OK(server->createOnServer());
     ZuBase::Pipe copy(*server);
     {
-        ZuBase::Pipe another(true);
+        ZuBase::Pipe another(false);
         another = copy;
+        QVERIFY(another.isServer());
         QCOMPARE(another.name(), ends.name);
     } // a copy going away leaves the handle open
     server.reset();
     QVERIFY(copy.isCreated());
-    QVERIFY(ends.client.connectOnClient().isOk());
-    QVERIFY(copy.acceptOnServer().isOk());
-    QVERIFY(passes(copy, ends.client, "ok"));
+    QVERIFY_OK(ends.client.connectOnClient());
+    QVERIFY_OK(copy.acceptOnServer());
+    ZuBase::Pipe connected(copy);
+    QVERIFY(connected.isConnected());
+    QVERIFY(passes(connected, ends.client, "ok"));
 
     // close() on one copy closes the shared handle for all of them; again it is harmless.
-    ZuBase::Pipe third(copy);
-    third.close();
-    QVERIFY(!copy.isCreated());
-    QVERIFY(!third.isConnected());
+    connected.close();
+    QVERIFY(!copy.isCreated() && !connected.isConnected());
     RkLogCapture capture;
     copy.close();
     QVERIFY(capture.entries().empty());
-    QVERIFY(copy.read(nullptr, 0).isOk()); // no transfer, no check
+    QVERIFY_OK(copy.read(nullptr, 0)); // no transfer, no check
+}
+
+void TestPipe::closeEndsABlockedAccept()
+{
+    Ends ends;
+    QVERIFY_OK(ends.server.createOnServer());
+    ZuBase::Pipe other(ends.server);
+    QElapsedTimer timer;
+    timer.start();
+    std::thread accepting([&] { other.acceptOnServer(); });
+    QTest::qWait(100);
+    ends.server.close();
+    accepting.join();
+    QVERIFY2(timer.elapsed() < 800, qPrintable(QString::number(timer.elapsed())));
 }
 
 void TestPipe::pipeServerAcceptsAndPaces()
@@ -383,9 +388,9 @@ void TestPipe::pipeServerAcceptsAndPaces()
     RkLogCapture capture;
     {
         ZuBase::PipeServer serving;
-        QVERIFY(serving.pipeSet(ends.server).isOk());
+        QVERIFY_OK(serving.pipeSet(ends.server));
         QVERIFY(ends.server.isCreated());
-        QVERIFY(ends.client.connectOnClient().isOk());
+        QVERIFY_OK(ends.client.connectOnClient());
         QTRY_VERIFY(ends.server.isConnected());
         QVERIFY(passes(ends.server, ends.client, pattern(4099)));
         // While the client stays, the serving thread does not spin.
