@@ -14,7 +14,7 @@ using TestSupport::logLines;
 
 namespace {
 
-const QString sWhere = QStringLiteral("src/core/zubase/File:ZuBase::File::");
+const QString kWhere = QStringLiteral("src/core/zubase/File:ZuBase::File::");
 
 // "where: message  detail" of each record, without line numbers.
 QStringList records(const RkResult& inResult)
@@ -34,7 +34,7 @@ void makeFile(const QString& inPath, const QByteArray& inData = "x")
     file.write(inData);
 }
 
-// Every entry below inRoot as a sorted relative path; directories end with "/".
+// Every entry below inRoot as a sorted relative path; folders end with "/".
 QStringList treeOf(const QString& inRoot)
 {
     QStringList entries;
@@ -93,7 +93,7 @@ class TestFile : public QObject
 {
     Q_OBJECT
 
-private slots:
+private Q_SLOTS:
     void readAll_data();
     void readAll();
     void writeAllToPath_data();
@@ -105,9 +105,8 @@ private slots:
     void removeDir_data();
     void removeDir();
     void removeDirDoesNotFollowASwappedFolder();
-    void reparseBufferBytes();
-    void reparseBufferParse_data();
-    void reparseBufferParse();
+    void reparseBuffer_data();
+    void reparseBuffer();
     void junctionCreate_data();
     void junctionCreate();
     void junctionInfo_data();
@@ -124,7 +123,6 @@ void TestFile::readAll_data()
     QTest::addColumn<QString>("name");
     QTest::addColumn<QByteArray>("content");
     QTest::addColumn<QString>("record");
-
     QTest::newRow("text and binary") << "a.bin" << QByteArray("hi\n\0\1\xff", 6) << QString();
     QTest::newRow("empty") << "c.txt" << QByteArray() << QString();
     QTest::newRow("missing") << "missing.txt" << QByteArray()
@@ -147,53 +145,49 @@ void TestFile::readAll()
     RkLogCapture capture;
     QByteArray buffer("left over");
     const RkResult res = ZuBase::File::readAll(path, buffer);
-    QCOMPARE(res.isBad(), !record.isEmpty());
     QCOMPARE(buffer, content);
     QCOMPARE(records(res), record.isEmpty() ? QStringList()
-                                            : QStringList{sWhere + "readAll: " + record.arg(path)});
+                                            : QStringList{kWhere + "readAll: " + record.arg(path)});
+    QCOMPARE(res.isBad(), !record.isEmpty());
     QCOMPARE(logLines(capture), QStringList()); // accumulated, never logged
 }
 
 void TestFile::writeAllToPath_data()
 {
     QTest::addColumn<QString>("path");
-    QTest::addColumn<QStringList>("records");
-    QTest::addColumn<QStringList>("logged");
-
-    QTest::newRow("new file") << "new.txt" << QStringList() << QStringList();
-    QTest::newRow("replaces longer file") << "old.txt" << QStringList() << QStringList();
+    QTest::addColumn<QString>("record"); // in the result
+    QTest::addColumn<QString>("logged");
+    QTest::newRow("new file") << "new.txt" << QString() << QString();
+    QTest::newRow("replaces longer file") << "old.txt" << QString() << QString();
     QTest::newRow("missing folder")
         << "no/such/dir/x.txt"
-        << QStringList{sWhere + "writeAll: %1  cond[file.open( QIODevice::WriteOnly | "
-                                "QIODevice::Truncate )]"}
-        << QStringList();
+        << kWhere + "writeAll: %1  cond[file.open( QIODevice::WriteOnly | QIODevice::Truncate )]"
+        << QString();
     // A full disk must show in the result, not vanish when the file is closed.
-    QTest::newRow("full disk") << "/dev/full" << QStringList()
-                               << QStringList{sWhere +
-                                              "writeAll: Internal Error  cond[numBytesDone > 0]"};
+    QTest::newRow("full disk") << "/dev/full" << QString()
+                               << kWhere + "writeAll: Internal Error  cond[numBytesDone > 0]";
 }
 
 void TestFile::writeAllToPath()
 {
     QFETCH(QString, path);
-    QFETCH(QStringList, records);
-    QFETCH(QStringList, logged);
+    QFETCH(QString, record);
+    QFETCH(QString, logged);
     if (!path.startsWith('/'))
         path = mTemp.filePath(path);
     if (path.endsWith("old.txt"))
         makeFile(path, QByteArray(1000, 'o'));
-    if (path == "/dev/full" && !QFileInfo::exists(path))
-        QSKIP("/dev/full is not available");
 
     RkLogCapture capture;
     const QByteArray data("new content\n");
     const RkResult res = ZuBase::File::writeAll(path, data);
-    QCOMPARE(res.isOk(), records.isEmpty() && logged.isEmpty());
-    QCOMPARE(::records(res), records.replaceInStrings("%1", path));
-    QCOMPARE(logLines(capture, "Tz", RkLogError), logged);
+    QCOMPARE(res.isOk(), record.isEmpty() && logged.isEmpty());
+    QCOMPARE(records(res), record.isEmpty() ? QStringList() : QStringList{record.arg(path)});
+    QCOMPARE(logLines(capture, "Tz", RkLogError),
+             logged.isEmpty() ? QStringList() : QStringList{logged});
     QByteArray back;
     if (res.isOk()) {
-        QVERIFY(ZuBase::File::readAll(path, back).isOk());
+        QVERIFY_OK(ZuBase::File::readAll(path, back));
         QCOMPARE(back, data);
     }
 }
@@ -204,8 +198,8 @@ void TestFile::writeAllToDevice_data()
     QTest::addColumn<qint64>("size"); // of "abcdefgh" given to the raw form
     QTest::addColumn<int>("writes");
     QTest::addColumn<bool>("ok");
-
     QTest::newRow("partial writes continue") << qint64(3) << qint64(8) << 3 << true;
+    QTest::newRow("nothing to write") << qint64(10) << qint64(0) << 0 << true;
     QTest::newRow("negative size") << qint64(10) << qint64(-5) << 0 << true;
     QTest::newRow("device takes nothing") << qint64(0) << qint64(3) << 1 << false;
 }
@@ -226,7 +220,7 @@ void TestFile::writeAllToDevice()
         QCOMPARE(device.mData, QByteArray(data, int(qMax(size, qint64(0)))));
     QCOMPARE(logLines(capture),
              ok ? QStringList()
-                : QStringList{sWhere + "writeAll: Internal Error  cond[numBytesDone > 0]"});
+                : QStringList{kWhere + "writeAll: Internal Error  cond[numBytesDone > 0]"});
 }
 
 void TestFile::removeFile_data()
@@ -234,9 +228,7 @@ void TestFile::removeFile_data()
     QTest::addColumn<QString>("path");
     QTest::addColumn<bool>("ok");
     QTest::addColumn<bool>("traced");
-
     QTest::newRow("existing") << "gone.txt" << true << true;
-    QTest::newRow("read-only") << "locked.txt" << true << true;
     QTest::newRow("missing") << "never.txt" << true << false;
     // Even root cannot unlink a file of the proc file system.
     QTest::newRow("undeletable") << "/proc/version" << false << true;
@@ -251,8 +243,6 @@ void TestFile::removeFile()
         path = mTemp.filePath(path);
         if (traced)
             makeFile(path);
-        if (path.endsWith("locked.txt"))
-            QVERIFY(QFile::setPermissions(path, QFile::ReadOwner | QFile::ReadOther));
     }
 
     RkLogCapture capture;
@@ -264,7 +254,7 @@ void TestFile::removeFile()
     QCOMPARE(
         logLines(capture, "Tz", RkLogError),
         ok ? QStringList()
-           : QStringList{sWhere + "removeFile: Internal Error  cond[!QFile::exists(inFilePath)]"});
+           : QStringList{kWhere + "removeFile: Internal Error  cond[!QFile::exists(inFilePath)]"});
     QCOMPARE(QFileInfo::exists(path), !ok);
 }
 
@@ -290,7 +280,7 @@ void TestFile::removeDir_data()
     row("not recursive keeps subfolders", "tree", false, "", "",
         "top/ top/sub/ top/sub/b.tmp top/sub/deeper/ top/sub/deeper/c.txt top/sub/link", fail);
     // The keep filter lists every folder too, so folders are kept whole.
-    row("keep filter keeps matches and every folder", "tree", true, "", "*.txt",
+    row("keep filter keeps matches and every folder", "tree", true, "", "*.TXT",
         "top/ top/a.txt top/sub/ top/sub/b.tmp top/sub/deeper/ top/sub/deeper/c.txt top/sub/link",
         fail);
     row("name filter removes only matching files", "tree", true, "*.tmp", "",
@@ -326,7 +316,7 @@ void TestFile::removeDir()
     }
 
     RkLogCapture capture;
-    QVERIFY(ZuBase::File::removeDir(top, recursive, nameFilters, keepFilters).isOk());
+    QVERIFY_OK(ZuBase::File::removeDir(top, recursive, nameFilters, keepFilters));
     remaining << "outside/"
               << "outside/precious.txt";
     remaining.sort();
@@ -335,15 +325,14 @@ void TestFile::removeDir()
     const QStringList trace = logLines(capture, "ZuBase", RkLogInfo);
     QCOMPARE(trace.isEmpty() ? QString() : trace.last(),
              lastTrace.replace("[top]", '[' + top + ']'));
-    // What went is information, what stayed a warning; when all went, nothing stayed.
+    // What went is information, what stayed a warning.
     const QStringList failed = trace.filter(QRegularExpression(" -> fail$"));
     QCOMPARE(logLines(capture, "ZuBase", RkLogWarning), failed);
     QCOMPARE(trace.size() - failed.size(), trace.filter(QRegularExpression(" -> ok$")).size());
-    if (lastTrace.endsWith("ok"))
-        QCOMPARE(failed, QStringList());
-    for (const char* file : {"top/a.txt", "top/sub/b.tmp"}) {
-        if (layout == "tree" && !remaining.contains(file))
-            QVERIFY(trace.contains(QString("QFile::remove() [%1] -> ok").arg(root.filePath(file))));
+    if (layout == "tree" && recursive && keepFilters.isEmpty()) {
+        QVERIFY(trace.contains("QFile::remove() [" + top + "/sub/b.tmp] -> ok"));
+        QCOMPARE(trace.contains("QDir::rmdir() [" + top + "/sub/deeper] -> fail"),
+                 !nameFilters.isEmpty());
     }
 }
 
@@ -371,72 +360,57 @@ void TestFile::removeDirDoesNotFollowASwappedFolder()
     QCOMPARE(QDir(top + "/moved").entryList(QDir::Files), QStringList());
 }
 
-void TestFile::reparseBufferBytes()
-{
-    // "\??\D:\data\" is 12 UTF-16 units: 24 name bytes, 44 in all.
-    QCOMPARE(
-        toBytes(ZuPlatform::mountPointBuild(ZuPlatform::mountPointSubstituteName(u"D:\\data"))),
-        QByteArray::fromHex("030000a0" // tag
-                            "24000000" // data length 36, reserved
-                            "00001800" // substitute name at 0, 24 bytes
-                            "1a000000" // print name at 26, empty
-                            "5c003f003f005c0044003a005c0064006100740061005c00"
-                            "00000000"));
-    // A target that already ends with a backslash gets no second one.
-    QCOMPARE(ZuPlatform::mountPointSubstituteName(u"E:\\"), std::u16string(u"\\??\\E:\\"));
-}
-
-void TestFile::reparseBufferParse_data()
+void TestFile::reparseBuffer_data()
 {
     QTest::addColumn<QByteArray>("buffer");
     QTest::addColumn<bool>("ok");
     QTest::addColumn<quint32>("tag");
-    QTest::addColumn<QString>("name");
     QTest::addColumn<QString>("target"); // of a mount point
 
-    // A mount point built for a substitute name reads back as that name and its target.
+    // "\??\D:\data\" is 12 UTF-16 units: 24 name bytes, 44 in all.
+    const QByteArray built =
+        toBytes(ZuPlatform::mountPointBuild(ZuPlatform::mountPointSubstituteName(u"D:\\data")));
+    QCOMPARE(built, QByteArray::fromHex("030000a0" // tag
+                                        "24000000" // data length 36, reserved
+                                        "00001800" // substitute name at 0, 24 bytes
+                                        "1a000000" // print name at 26, empty
+                                        "5c003f003f005c0044003a005c0064006100740061005c00"
+                                        "00000000"));
+    // A target that already ends with a backslash gets no second one.
+    QCOMPARE(ZuPlatform::mountPointSubstituteName(u"E:\\"), std::u16string(u"\\??\\E:\\"));
+
     const auto mountPoint = [](const char* inRow, const QString& inName, const QString& inTarget) {
         QTest::newRow(inRow) << toBytes(ZuPlatform::mountPointBuild(inName.toStdU16String()))
-                             << true << 0xA0000003u << inName << inTarget;
+                             << true << 0xA0000003u << inTarget;
     };
-    mountPoint("folder", "\\??\\D:\\data\\", "D:\\data");
-    mountPoint("non-ASCII", QString::fromUtf8("\\??\\C:\\Bilder ä€\\"),
-               QString::fromUtf8("C:\\Bilder ä€"));
+    QTest::newRow("built") << built << true << 0xA0000003u << "D:\\data";
     mountPoint("drive root keeps its backslash", "\\??\\X:\\", "X:\\");
-    mountPoint("posix path", "\\??\\/srv/data\\", "/srv/data");
-    mountPoint("posix root", "\\??\\/\\", "/");
-    mountPoint("no prefix", "D:\\data\\", "D:\\data");
-    mountPoint("only one backslash dropped", "\\??\\D:\\a\\\\", "D:\\a\\");
-    QTest::newRow("symbolic link tag") << QByteArray::fromHex("0c0000a00000000000000000") << true
-                                       << 0xA000000Cu << QString() << QString();
-    QTest::newRow("too short") << QByteArray::fromHex("030000") << false << 0u << QString()
-                               << QString();
+    mountPoint("no prefix, only one backslash dropped", "D:\\a\\\\", "D:\\a\\");
+    QTest::newRow("symbolic link tag")
+        << QByteArray::fromHex("0c0000a000000000") << true << 0xA000000Cu << QString();
+    QTest::newRow("too short") << QByteArray::fromHex("030000a000000000000000") << false
+                               << 0xA0000003u << QString();
     // A name length pointing past the end must not be read.
     QTest::newRow("length past end")
         << QByteArray::fromHex("030000a0100000000000ff000000000041004200") << false << 0xA0000003u
-        << QString() << QString();
+        << QString();
     QTest::newRow("odd length") << QByteArray::fromHex("030000a010000000000003000000000041004200")
-                                << false << 0xA0000003u << QString() << QString();
+                                << false << 0xA0000003u << QString();
 }
 
-void TestFile::reparseBufferParse()
+void TestFile::reparseBuffer()
 {
     QFETCH(QByteArray, buffer);
     QFETCH(bool, ok);
     QFETCH(quint32, tag);
-    QFETCH(QString, name);
     QFETCH(QString, target);
     std::uint32_t outTag = 0;
     std::u16string outName;
     QCOMPARE(ZuPlatform::reparseBufferParse(reinterpret_cast<const std::uint8_t*>(buffer.data()),
                                             std::size_t(buffer.size()), outTag, outName),
              ok);
-    if (ok || tag)
-        QCOMPARE(quint32(outTag), tag);
-    if (ok)
-        QCOMPARE(QString::fromStdU16String(outName), name);
-    if (ok && tag == ZuPlatform::kReparseTagMountPoint)
-        QCOMPARE(QString::fromStdU16String(ZuPlatform::mountPointTarget(outName)), target);
+    QCOMPARE(quint32(outTag), tag);
+    QCOMPARE(QString::fromStdU16String(ZuPlatform::mountPointTarget(outName)), target);
 }
 
 void TestFile::junctionCreate_data()
@@ -472,8 +446,10 @@ void TestFile::junctionCreate()
     QFETCH(QString, failure);
     QFETCH(QString, after);
 
+    // A target name of one, two, three and four bytes per character.
     QTemporaryDir root;
-    const QString targetDir = root.filePath("target dir");
+    const QString targetName = QString::fromUtf8("target \u00e4\u20ac\U0001D11E");
+    const QString targetDir = root.filePath(targetName);
     makeFile(targetDir + "/inside.txt");
     QString junction = root.filePath("j");
     if (before == "empty dir")
@@ -481,8 +457,7 @@ void TestFile::junctionCreate()
     else if (before == "full dir")
         makeFile(junction + "/keep.txt");
     else if (before == "link")
-        QVERIFY(QDir().mkpath(root.filePath("elsewhere")) &&
-                QFile::link(root.filePath("elsewhere"), junction));
+        QVERIFY(QFile::link(root.path(), junction));
     else if (before == "no parent")
         junction = root.filePath("missing/j");
     else if (before == "file")
@@ -493,7 +468,7 @@ void TestFile::junctionCreate()
     if (target == "relative") {
         const QString previous = QDir::currentPath();
         QDir::setCurrent(root.path());
-        res = ZuBase::File::junctionCreate("j", "target dir");
+        res = ZuBase::File::junctionCreate("j", targetName);
         QDir::setCurrent(previous);
     } else {
         // Longer than any link target the system stores.
@@ -504,19 +479,14 @@ void TestFile::junctionCreate()
     }
     QCOMPARE(res.isOk(), after == "link");
     const QStringList failures = logLines(capture, "Tz", RkLogError);
-    if (failure.isEmpty()) {
-        QCOMPARE(failures, QStringList());
-    } else {
-        QCOMPARE(failures.size(), 2);
-        QCOMPARE(failures.first(), sWhere + "junctionCreate: " + failure);
-        QVERIFY(failures.at(1).startsWith("last error "));
-    }
-
+    QCOMPARE(failures.value(0),
+             failure.isEmpty() ? QString() : kWhere + "junctionCreate: " + failure);
+    QCOMPARE(failures.size(), failure.isEmpty() ? 0 : 2); // with the last error
     QCOMPARE(whatIsAt(junction), after == "link" ? "link to " + targetDir : after);
     if (after == "link") {
         bool isJunction = false;
         QString outTarget;
-        QVERIFY(ZuBase::File::junctionInfo(junction, isJunction, outTarget).isOk());
+        QVERIFY_OK(ZuBase::File::junctionInfo(junction, isJunction, outTarget));
         QVERIFY(isJunction);
         QCOMPARE(outTarget, QDir::toNativeSeparators(targetDir));
         QVERIFY(QFileInfo::exists(junction + "/inside.txt"));
@@ -528,13 +498,11 @@ void TestFile::junctionInfo_data()
     QTest::addColumn<QString>("path");
     QTest::addColumn<bool>("ok");
     QTest::addColumn<QString>("target"); // empty: no junction
-
     // A link made elsewhere with a relative target reports it from the link's folder.
     QTest::newRow("link with a relative target") << "relative" << true << "target dir";
     QTest::newRow("link whose target has gone") << "gone" << true << "removed dir";
     QTest::newRow("plain folder") << "target dir" << true << "";
     QTest::newRow("file") << "target dir/file.txt" << false << "";
-    QTest::newRow("missing") << "missing" << false << "";
     QTest::newRow("empty") << "" << false << "";
 }
 
@@ -551,10 +519,8 @@ void TestFile::junctionInfo()
     RkLogCapture capture;
     bool isJunction = true;
     QString outTarget = "stale";
-    QCOMPARE(ZuBase::File::junctionInfo(path.isEmpty() ? path : root.filePath(path), isJunction,
-                                        outTarget)
-                 .isOk(),
-             ok);
+    const QString full = path.isEmpty() ? path : root.filePath(path);
+    QCOMPARE(ZuBase::File::junctionInfo(full, isJunction, outTarget).isOk(), ok);
     QCOMPARE(isJunction, !target.isEmpty());
     QCOMPARE(outTarget,
              target.isEmpty() ? QString() : QDir::toNativeSeparators(root.filePath(target)));
@@ -569,12 +535,9 @@ void TestFile::pathsPointToTheSameFile_data()
     const auto row = [](const char* inRow, const char* inA, const char* inB, bool inSame) {
         QTest::newRow(inRow) << inA << inB << inSame;
     };
-    row("same path", "d/one.txt", "d/one.txt", true);
     row("dot-dot spelling", "d/one.txt", "d/../d/./one.txt", true);
-    row("through a link", "d/one.txt", "link.txt", true);
     row("through a folder link", "d/one.txt", "dlink/one.txt", true);
     row("two files in one folder", "d/one.txt", "d/two.txt", false);
-    row("same name in two folders", "d/one.txt", "e/one.txt", false);
     row("missing", "d/one.txt", "d/none.txt", false);
     row("empty", "", "", false);
 }
@@ -587,8 +550,6 @@ void TestFile::pathsPointToTheSameFile()
     QTemporaryDir root;
     makeFile(root.filePath("d/one.txt"));
     makeFile(root.filePath("d/two.txt"));
-    makeFile(root.filePath("e/one.txt"));
-    QVERIFY(QFile::link(root.filePath("d/one.txt"), root.filePath("link.txt")));
     QVERIFY(QFile::link(root.filePath("d"), root.filePath("dlink")));
     const auto full = [&](const QString& inPath) {
         return inPath.isEmpty() ? QString() : root.filePath(inPath);
