@@ -4,7 +4,6 @@
 
 #include <QTcpServer>
 #include <QTcpSocket>
-#include <QtTest>
 
 #include <sys/socket.h>
 #include <unistd.h>

@@ -3,12 +3,6 @@
 #include "zubase/Hardware.h"
 #include "zubase/system/Hardware_p.h"
 
-#include <QDir>
-#include <QFile>
-#include <QProcess>
-#include <QTemporaryDir>
-#include <QtTest>
-
 #include <sys/statvfs.h>
 
 using TestSupport::logLines;

@@ -4,14 +4,7 @@
 #include "zubase/Impersonation.h"
 #include "zubase/system/Impersonation_p.h"
 
-#include <QFile>
-#include <QFileInfo>
 #include <QHostInfo>
-#include <QProcess>
-#include <QSemaphore>
-#include <QStandardPaths>
-#include <QTemporaryDir>
-#include <QtTest>
 
 #include <atomic>
 #include <grp.h>
