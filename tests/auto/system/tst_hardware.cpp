@@ -85,6 +85,7 @@ void TestHardware::hardwareTypeFromTool_data()
     QTest::addColumn<QString>("tool"); // what the application folder holds
     QTest::addColumn<QStringList>("expected");
     QTest::newRow("dmidecode.exe before dmidecode") << "both" << kSampleTexts;
+    QTest::newRow("only an executable counts") << "not executable" << kSampleTexts;
     QTest::newRow("a tool that does not end") << "hanging" << kSampleTexts;
     QTest::newRow("no tool") << "none" << QStringList{"N/A", "N/A", "N/A"};
 }
@@ -101,6 +102,10 @@ void TestHardware::hardwareTypeFromTool()
     if (tool == "both") {
         writeTool(appDir + "/dmidecode.exe", kSample);
         writeTool(appDir + "/dmidecode", "/dev/null");
+    } else if (tool == "not executable") {
+        writeTool(appDir + "/dmidecode.exe", "/dev/null");
+        QFile(appDir + "/dmidecode.exe").setPermissions(QFile::ReadOwner);
+        writeTool(appDir + "/dmidecode", kSample);
     } else if (tool == "hanging") {
         writeTool(appDir + "/dmidecode", kSample, true);
     }
@@ -109,6 +114,7 @@ void TestHardware::hardwareTypeFromTool()
     QVERIFY(probe.waitForFinished(30000));
     QCOMPARE(QString::fromLocal8Bit(probe.readAllStandardOutput()).split('\n', Qt::SkipEmptyParts),
              expected);
+    QCOMPARE(probe.readAllStandardError(), QByteArray()); // not even a warning
 }
 
 void TestHardware::diskSpace()

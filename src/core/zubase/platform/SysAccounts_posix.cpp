@@ -77,6 +77,14 @@ int threadSetResUid(uid_t inReal, uid_t inEffective, uid_t inSaved)
     return ::syscall(SYS_setresuid, inReal, inEffective, inSaved) == 0 ? 0 : errno;
 }
 
+// Puts the saved groups back; the first error wins.
+int restoreGroups(const SavedIdentity& inSaved)
+{
+    const int error = threadSetResGid(inSaved.rgid, inSaved.egid, inSaved.sgid);
+    const int groupsError = threadSetGroups(inSaved.groups);
+    return error != 0 ? error : groupsError;
+}
+
 std::vector<gid_t> currentGroups()
 {
     const int count = ::getgroups(0, nullptr);
@@ -436,15 +444,13 @@ int accountsImpersonate(const AccountToken* inToken)
     const uid_t unchangedUid = static_cast<uid_t>(-1);
     if (const int error = threadSetGroups(inToken->groups))
         return error;
-    if (const int error = threadSetResGid(unchangedGid, inToken->gid, unchangedGid)) {
-        threadSetGroups(saved.groups);
-        return error;
-    }
-    // Only the effective user changes: the saved user keeps the way back, and the permitted
-    // capabilities stay (out of effect) for it.
-    if (const int error = threadSetResUid(unchangedUid, inToken->uid, unchangedUid)) {
-        threadSetResGid(saved.rgid, saved.egid, saved.sgid);
-        threadSetGroups(saved.groups);
+    // Only the effective group and user change: the saved ones keep the way back, and the
+    // permitted capabilities stay (out of effect) for it.
+    int error = threadSetResGid(unchangedGid, inToken->gid, unchangedGid);
+    if (error == 0)
+        error = threadSetResUid(unchangedUid, inToken->uid, unchangedUid);
+    if (error != 0) {
+        restoreGroups(saved);
         return error;
     }
     saved.impersonating = true;
@@ -460,9 +466,7 @@ int accountsRevertToSelf()
     // The user first: becoming the own user again brings back the privileges for the rest.
     if (const int error = threadSetResUid(tSaved.ruid, tSaved.euid, tSaved.suid))
         return error;
-    int error = threadSetResGid(tSaved.rgid, tSaved.egid, tSaved.sgid);
-    if (const int groupsError = threadSetGroups(tSaved.groups); !error)
-        error = groupsError;
+    const int error = restoreGroups(tSaved);
     tSaved = SavedIdentity();
     tImpersonating = false;
     return error;

@@ -385,12 +385,12 @@ int closePipe(PipeHandle inPipe)
         shutdown(conn, SHUT_RDWR);
     if (const int listener = object->listenFd; listener != UniqueFd::kNone)
         shutdown(listener, SHUT_RDWR);
+    // The files go now; the lock goes with the descriptor, which a new server of the name never
+    // meets, since it makes a new lock file.
     std::lock_guard<std::mutex> lock(object->mutex);
     if (object->server) {
         unlink(object->socketPath.c_str());
         unlink(object->lockPath.c_str());
-        flock range = wholeFile(F_UNLCK);
-        fcntl(object->lockFd.get(), F_OFD_SETLK, &range);
     }
     return 0;
 }

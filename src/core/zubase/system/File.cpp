@@ -302,9 +302,7 @@ bool pathsPointToTheSameFile(const QString& inPath1, const QString& inPath2)
     // The files themselves, not only their folders: two files side by side are not the same.
     const QString canonical1 = QFileInfo(inPath1).canonicalFilePath();
     const QString canonical2 = QFileInfo(inPath2).canonicalFilePath();
-    if (canonical1.isEmpty() || canonical2.isEmpty())
-        return false;
-    return canonical1 == canonical2;
+    return !canonical1.isEmpty() && canonical1 == canonical2; // a missing file is no file
 }
 
 } // namespace ZuBase::File

@@ -104,6 +104,7 @@ void getHardwareType(QString& outProductName, QString& outSerialNumber, QString&
     // A tool that has not finished in time still gives what it has printed so far.
     process.waitForFinished(kFinishTimeout);
     const QByteArray output = process.readAllStandardOutput();
+    // Ended here, so that the QProcess destructor has no running process to warn about.
     if (process.state() != QProcess::NotRunning) {
         process.kill();
         process.waitForFinished(kKillTimeout);

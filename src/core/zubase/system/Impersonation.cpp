@@ -21,27 +21,22 @@ QString& pamServiceSetting()
     return sService;
 }
 
-// Overwrites a secret before its memory is given back.
-void wipe(QByteArray& ioBytes)
+// Overwrites a secret before its memory is given back, on every way out of its scope.
+template <typename Text> class WipedOnExit
 {
-    if (!ioBytes.isEmpty())
-        ::explicit_bzero(ioBytes.data(), static_cast<std::size_t>(ioBytes.size()));
-    ioBytes.clear();
-}
+public:
+    explicit WipedOnExit(Text& ioText) : mText(ioText) {}
+    ~WipedOnExit()
+    {
+        ::explicit_bzero(static_cast<void*>(mText.data()), sizeof(*mText.data()) * mText.size());
+        mText.clear();
+    }
+    WipedOnExit(const WipedOnExit&) = delete;
+    WipedOnExit& operator=(const WipedOnExit&) = delete;
 
-void wipe(QString& ioText)
-{
-    if (!ioText.isEmpty())
-        ioText.fill(QChar(0));
-    ioText.clear();
-}
-
-void wipe(std::string& ioText)
-{
-    if (!ioText.empty())
-        ::explicit_bzero(&ioText[0], ioText.size());
-    ioText.clear();
-}
+private:
+    Text& mText;
+};
 
 ZuPlatform::AccountToken* accountToken(void* inToken)
 {
@@ -259,13 +254,11 @@ bool Win32Impersonation::login()
         return false;
     QString user;
     QString password;
+    const WipedOnExit<QString> wipedPassword(password);
     getImpersonationUser(user, password);
-    if (user.isEmpty() || password.isEmpty()) {
-        wipe(password);
+    if (user.isEmpty() || password.isEmpty())
         return true; // no impersonation wanted
-    }
     sAccessToken = win32Login(user, password);
-    wipe(password);
     return sAccessToken != nullptr;
 }
 
@@ -299,12 +292,12 @@ void* Win32Impersonation::win32Login(QString& inUser, QString& inPassword)
     // the local 8-bit encoding, as the account database stores it here: Latin-1 would turn
     // every character beyond it into '?' and let such passwords collide.
     QByteArray passwordBytes = inPassword.toLocal8Bit();
+    const WipedOnExit<QByteArray> wipedBytes(passwordBytes);
     std::string password(passwordBytes.constData(), static_cast<std::size_t>(passwordBytes.size()));
-    wipe(passwordBytes);
+    const WipedOnExit<std::string> wipedPassword(password);
     ZuPlatform::AccountToken* token = nullptr;
     const int error =
         ZuPlatform::accountsLogon(Q2M(pamServiceName()).toStdString(), pamUser, password, token);
-    wipe(password);
     Tz::logWinFunc(token ? 1 : 0, 1, "::LogonUser", Q2M(inUser).constData(), true, error);
     return token;
 }
