@@ -269,18 +269,17 @@ void TestRkLog::logFileFromEnvironment()
     const QString path = dir.filePath("log.txt");
     qputenv("ZUBASE_LOG_FILE", path.toLocal8Bit());
     qputenv("ZUBASE_LOG_LEVEL", "2");
+    RkLogFile log;
+    log.printf("not written");
+    log.tracef(RkLogOff, "ZuBase", "never written");
+    log.tracef(RkLogWarning, "ZuBase", "value [%s]", "a\nE Tz: forged\r\x1b[2J\tb");
+    // The children the library starts must not inherit the log file.
     bool closedOnExec = false;
-    {
-        RkLogFile log;
-        log.printf("not written");
-        log.tracef(RkLogWarning, "ZuBase", "value [%s]", "a\nE Tz: forged\r\x1b[2J\tb");
-        // The children the library starts must not inherit the log file.
-        for (const QFileInfo& fd : QDir("/proc/self/fd").entryInfoList(QDir::Files | QDir::System))
-            if (fd.symLinkTarget() == path)
-                closedOnExec = fcntl(fd.fileName().toInt(), F_GETFD) & FD_CLOEXEC;
-    }
+    for (const QFileInfo& fd : QDir("/proc/self/fd").entryInfoList(QDir::Files | QDir::System))
+        if (fd.symLinkTarget() == path)
+            closedOnExec = fcntl(fd.fileName().toInt(), F_GETFD) & FD_CLOEXEC;
     QVERIFY(closedOnExec);
-    QFile file(path);
+    QFile file(path); // read while the log is open: each line is there at once
     QVERIFY(file.open(QIODevice::ReadOnly));
     const QStringList lines = QString::fromUtf8(file.readAll()).split('\n', Qt::SkipEmptyParts);
     QCOMPARE(lines.size(), 1);

@@ -353,6 +353,7 @@ void TestPipe::pipeServerAcceptsAndPaces()
 {
     Ends ends;
     RkLogCapture capture;
+    QElapsedTimer stopping;
     {
         ZuBase::PipeServer serving;
         QVERIFY_OK(serving.pipeSet(ends.server));
@@ -364,7 +365,9 @@ void TestPipe::pipeServerAcceptsAndPaces()
         QTest::qWait(1200);
         const auto texts = capture.texts();
         QVERIFY(std::count(texts.begin(), texts.end(), "pipeConnected") <= 3);
-    } // the destructor stops the thread
+        stopping.start();
+    } // the destructor stops the thread, without waiting for the pace of the passes
+    QVERIFY2(stopping.elapsed() < 500, qPrintable(QString::number(stopping.elapsed())));
     QVERIFY(ends.server.isCreated());
 
     // A pipe that cannot be created starts no thread.
