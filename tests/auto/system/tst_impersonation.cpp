@@ -254,8 +254,10 @@ void TestImpersonation::adjustPrivilege()
     };
     // A held privilege by its usual name or a capability's own name; an unknown name and a
     // token that is no token fail.
+    const uint descriptors = QDir("/proc/self/fd").count();
     QVERIFY(adjust(kProcessToken, "SeRestorePrivilege", true));
     QVERIFY(adjust(kProcessToken, "cap_fowner", true));
+    QCOMPARE(QDir("/proc/self/fd").count(), descriptors); // none left open
     QVERIFY(!adjust(kProcessToken, "SeNoSuchPrivilege", true));
     QVERIFY(!adjust(nullptr, "SeRestorePrivilege", true));
     const QStringList errors = logLines(capture, nullptr, RkLogError);
@@ -404,10 +406,14 @@ void TestImpersonation::impersonationIsPerThread()
     QSemaphore impersonating, mainWrote;
     long workerId = 0;
     bool insideOk = false, afterOk = false;
+    std::uint64_t effectiveInside = ~0u;
     std::thread worker([&] {
         workerId = ::syscall(SYS_gettid);
         {
             ZuBase::Win32Impersonation scope;
+            // The account holds no privileges, also when the process token enables one.
+            ZuBase::win32TokenAdjustPrivilege(kProcessToken, (char*)"SeRestorePrivilege", true);
+            effectiveInside = ownCapabilities().first;
             impersonating.release();
             mainWrote.acquire();
             insideOk = createFile(dir.filePath("inside"));
@@ -424,6 +430,7 @@ void TestImpersonation::impersonationIsPerThread()
     worker.join();
 
     QVERIFY(mainOk && insideOk && afterOk);
+    QCOMPARE(effectiveInside, std::uint64_t(0));
     const QFileInfo inside(dir.filePath("inside"));
     QCOMPARE(QList<uint>({inside.ownerId(), inside.groupId()}), QList<uint>({mUid, mGid}));
     QCOMPARE(QFileInfo(dir.filePath("main")).ownerId(), uint(0));
