@@ -103,30 +103,32 @@ std::shared_ptr<Child> findChild(pid_t inPid)
     return found == c.byPid.end() ? nullptr : found->second.lock();
 }
 
+// Repeats a system call that a signal interrupted and gives its result.
+template <typename Call> auto uninterrupted(Call inCall)
+{
+    auto result = inCall();
+    while (result < 0 && errno == EINTR)
+        result = inCall();
+    return result;
+}
+
+// Collects the end of a child; true when it was ours to collect.
+bool collect(pid_t inPid, int& outStatus, int inOptions = 0)
+{
+    return uninterrupted([&] { return waitpid(inPid, &outStatus, inOptions); }) == inPid;
+}
+
 // Waits for the end without collecting it first, so that the pid cannot be reused while
 // terminateProcess() may still signal it under the child's lock.
 void reap(std::shared_ptr<Child> inChild)
 {
     siginfo_t info;
-    for (;;) {
-        std::memset(&info, 0, sizeof info);
-        if (waitid(P_PID, inChild->pid, &info, WEXITED | WNOWAIT) == 0)
-            break;
-        if (errno != EINTR) {
-            std::lock_guard<std::mutex> lock(inChild->mutex);
-            inChild->ended = true;
-            inChild->lost = true;
-            return;
-        }
-    }
+    const bool seen =
+        uninterrupted([&] { return waitid(P_PID, inChild->pid, &info, WEXITED | WNOWAIT); }) == 0;
     std::lock_guard<std::mutex> lock(inChild->mutex);
     int status = 0;
-    pid_t got;
-    do {
-        got = waitpid(inChild->pid, &status, 0);
-    } while (got < 0 && errno == EINTR);
+    inChild->lost = !seen || !collect(inChild->pid, status);
     inChild->ended = true;
-    inChild->lost = got != inChild->pid;
     inChild->status = status;
 }
 
@@ -276,10 +278,7 @@ void writeErrorAndExit(int inPipe, int inError)
 int readError(int inPipe)
 {
     int error = 0;
-    ssize_t got;
-    do {
-        got = read(inPipe, &error, sizeof error);
-    } while (got < 0 && errno == EINTR);
+    const ssize_t got = uninterrupted([&] { return read(inPipe, &error, sizeof error); });
     return got == static_cast<ssize_t>(sizeof error) ? error : 0;
 }
 
@@ -340,11 +339,7 @@ int createProcessSuspended(const std::string& inCommandLine, const char* inEnvir
 
     errorWriter.reset();
     int status = 0;
-    pid_t got;
-    do {
-        got = waitpid(pid, &status, WUNTRACED);
-    } while (got < 0 && errno == EINTR);
-    if (got != pid) {
+    if (!collect(pid, status, WUNTRACED)) {
         // Its stop cannot be seen (the host collects children itself): do not leave it.
         const int error = errno;
         kill(pid, SIGKILL);
@@ -600,27 +595,20 @@ int shellExecuteElevated(const std::string& inFile, const std::vector<std::strin
     errorWriter.reset();
     startWriter.reset();
     // The error pipe closes when the tool has been loaded, or carries the error of the attempt.
+    int status = 0;
     if (const int error = readError(errorReader.get())) {
-        int status;
-        while (waitpid(pid, &status, 0) < 0 && errno == EINTR) {
-        }
+        collect(pid, status);
         return error;
     }
     // The start pipe closes when the tool has started the program, or when it ends without:
     // after a refusal, or a request the user declined (then it ends with 126 or 127).
     char byte;
-    while (read(startReader.get(), &byte, 1) < 0 && errno == EINTR) {
-    }
+    uninterrupted([&] { return read(startReader.get(), &byte, 1); });
     if (!isEnding(pid)) {
         adoptChild(pid, false); // the program runs; collected when it ends
         return 0;
     }
-    int status = 0;
-    pid_t got;
-    do {
-        got = waitpid(pid, &status, 0);
-    } while (got < 0 && errno == EINTR);
-    if (got != pid)
+    if (!collect(pid, status))
         return 0; // collected by the host: nothing tells that it failed
     // Any other code is the program's own, of a program that ended at once.
     const int code = exitCodeOf(status, false, 0);
