@@ -1,11 +1,10 @@
-// Failure records, their reporting and the log they go to.
+// Failure records and the log they go to. (How records are reported is checked wherever a
+// family reports one.)
 #include "TestSupport.h"
 
 #include "rklib/RkCheck.h"
 #include "rklib/RkLogFile.h"
-#include "rklib/Tz.h"
 
-#include <cerrno>
 #include <thread>
 
 #include <fcntl.h>
@@ -56,7 +55,6 @@ private Q_SLOTS:
     void checkRecords();
     void qualifiedFunctionName_data();
     void qualifiedFunctionName();
-    void reporting();
     void writeCallbackLevelsAndDisabler();
     void captureAndSinks();
     void logLevelFromEnvironment();
@@ -78,22 +76,6 @@ void TestRkLog::checkRecords_data()
                               << where + "count  val[7]  exp[1]";
     QTest::newRow("ne fails") << described(RK_CHECK_NE(QStringLiteral("x"), "x", "not x"))
                               << where + "not x  val[x]  notexp[x]";
-
-    // Accumulated records travel in order; a result made bad carries none.
-    RkResult res;
-    res << RkResult();
-    res << RkResult(RkResult::Error, 10, "a:f", "first", "cond[a]");
-    res << RkResult(RkResult::Warning, 20, "b:g", "second", "cond[b]");
-    QTest::newRow("accumulated") << described(res)
-                                 << "bad a:f(#): first  cond[a]\nb:g(#): second  cond[b]";
-    RkResult warning(RkResult::Warning, 5, "w", "m", "d");
-    QTest::newRow("warning only") << described(warning) << "ok w(#): m  d";
-    warning << warning;
-    QTest::newRow("appended to itself") << described(warning) << "ok w(#): m  d\nw(#): m  d";
-    RkResult made;
-    made.makeBad(1);
-    QTest::newRow("made bad") << described(made) << "bad ";
-    QTest::newRow("two texts") << described(RkResult(RkResult::Error, "", "")) << "bad (0):   ";
 }
 
 void TestRkLog::checkRecords()
@@ -135,32 +117,6 @@ void TestRkLog::qualifiedFunctionName()
     QCOMPARE(Rk::sourceFamily("../../src/core/zubase/system/Pipe.cpp"),
              std::string("src/core/zubase/Pipe"));
     QCOMPARE(Rk::sourceFamily("C:\\b\\tests\\tst_x.cpp"), std::string("tst_x"));
-}
-
-void TestRkLog::reporting()
-{
-    RkLogCapture capture;
-    QVERIFY(!Tz::fail(RkResult()));
-    QVERIFY(!Tz::failWin(RkResult(), EIO));
-    QVERIFY(capture.entries().empty());
-
-    RkResult res(RkResult::Error, 12, "src/core/zubase/File:ZuBase::File::readAll",
-                 "Internal Error", "cond[file.exists()]");
-    res << RkResult(RkResult::Error, 13, "w", "m", "d");
-    QVERIFY(Tz::fail(res));
-    errno = ENOENT;
-    QVERIFY(Tz::failWin(RkResult(RkResult::Error, 5, "w", "::ReadFile", "cond[bret]")));
-    QVERIFY(!Tz::logWinFunc(1, 1, "::RevertToSelf", nullptr, true));
-    QVERIFY(!Tz::logWinFunc(1, 1, "::GetTokenInformation", "", false));
-    QVERIFY(Tz::logWinFunc(0, 1, "::LogonUser", "user", true, EACCES));
-    QCOMPARE(capture.lines(),
-             std::vector<std::string>(
-                 {"E Tz: src/core/zubase/File:ZuBase::File::readAll(12): Internal Error  "
-                  "cond[file.exists()]",
-                  "E Tz: w(13): m  d", "E Tz: w(5): ::ReadFile  cond[bret]",
-                  "E Tz: last error 2: No such file or directory", "I Tz: ::RevertToSelf -> ok",
-                  "D Tz: ::GetTokenInformation -> ok",
-                  "E Tz: ::LogonUser user -> 0, last error 13: Permission denied"}));
 }
 
 void TestRkLog::writeCallbackLevelsAndDisabler()
