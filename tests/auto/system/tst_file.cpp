@@ -91,10 +91,8 @@ class TestFile : public QObject
     Q_OBJECT
 
 private Q_SLOTS:
-    void readAll_data();
-    void readAll();
-    void writeAllToPath_data();
-    void writeAllToPath();
+    void wholeFiles_data();
+    void wholeFiles();
     void writeAllToDevice();
     void removeFile_data();
     void removeFile();
@@ -104,7 +102,6 @@ private Q_SLOTS:
     void reparseBuffer();
     void junctionCreate_data();
     void junctionCreate();
-    void junctionInfo_data();
     void junctionInfo();
     void pathsPointToTheSameFile();
 
@@ -112,70 +109,51 @@ private:
     QTemporaryDir mTemp;
 };
 
-void TestFile::readAll_data()
+void TestFile::wholeFiles_data()
 {
-    QTest::addColumn<QString>("name");
-    QTest::addColumn<QByteArray>("content");
-    QTest::addColumn<QString>("record");
-    QTest::newRow("text and binary") << "a.bin" << QByteArray("hi\n\0\1\xff", 6) << QString();
-    QTest::newRow("missing") << "missing.txt" << QByteArray()
-                             << "Internal Error  cond[file.exists()]";
-    QTest::newRow("directory") << "dir" << QByteArray()
-                               << "%1  cond[file.open( QIODevice::ReadOnly )]";
-}
-
-void TestFile::readAll()
-{
-    QFETCH(QString, name);
-    QFETCH(QByteArray, content);
-    QFETCH(QString, record);
-    const QString path = mTemp.filePath(name);
-    if (name == "dir")
-        QDir().mkpath(path);
-    else if (name != "missing.txt")
-        makeFile(path, content);
-
-    RkLogCapture capture;
-    QByteArray buffer("left over");
-    const RkResult res = ZuBase::File::readAll(path, buffer);
-    QCOMPARE(buffer, content);
-    QCOMPARE(records(res), listOf(record.isEmpty() ? "" : kWhere + "readAll: " + record.arg(path)));
-    QCOMPARE(res.isBad(), !record.isEmpty());
-    QCOMPARE(logLines(capture), QStringList()); // accumulated, never logged
-}
-
-void TestFile::writeAllToPath_data()
-{
+    QTest::addColumn<bool>("write");
     QTest::addColumn<QString>("path");
     QTest::addColumn<QString>("record"); // in the result
     QTest::addColumn<QString>("logged");
-    QTest::newRow("replaces longer file") << "old.txt" << QString() << QString();
-    QTest::newRow("missing folder")
-        << "no/such/dir/x.txt"
-        << kWhere + "writeAll: %1  cond[file.open( QIODevice::WriteOnly | QIODevice::Truncate )]"
-        << QString();
+    const QString read = kWhere + "readAll: ", write = kWhere + "writeAll: ";
+    QTest::newRow("read text and binary") << false << "old.bin" << QString() << QString();
+    QTest::newRow("read missing") << false << "missing.txt"
+                                  << read + "Internal Error  cond[file.exists()]" << QString();
+    QTest::newRow("read a folder")
+        << false << "dir" << read + "%1  cond[file.open( QIODevice::ReadOnly )]" << QString();
+    QTest::newRow("write over a longer file") << true << "old.bin" << QString() << QString();
+    QTest::newRow("write into no folder")
+        << true << "no/dir/x.txt"
+        << write + "%1  cond[file.open( QIODevice::WriteOnly | QIODevice::Truncate )]" << QString();
     // A full disk must show in the result, not vanish when the file is closed.
-    QTest::newRow("full disk") << "/dev/full" << QString()
-                               << kWhere + "writeAll: Internal Error  cond[numBytesDone > 0]";
+    QTest::newRow("write a full disk")
+        << true << "/dev/full" << QString() << write + "Internal Error  cond[numBytesDone > 0]";
 }
 
-void TestFile::writeAllToPath()
+void TestFile::wholeFiles()
 {
+    QFETCH(bool, write);
     QFETCH(QString, path);
     QFETCH(QString, record);
     QFETCH(QString, logged);
     if (!path.startsWith('/'))
         path = mTemp.filePath(path);
-    makeFile(mTemp.filePath("old.txt"), QByteArray(1000, 'o'));
+    const QByteArray old("hi\n\0\1\xff and more", 17), data("new content\n");
+    makeFile(mTemp.filePath("old.bin"), old);
+    QDir().mkpath(mTemp.filePath("dir"));
 
     RkLogCapture capture;
-    const QByteArray data("new content\n");
-    const RkResult res = ZuBase::File::writeAll(path, data);
+    QByteArray buffer("left over");
+    const RkResult res =
+        write ? ZuBase::File::writeAll(path, data) : ZuBase::File::readAll(path, buffer);
     QCOMPARE(records(res), listOf(record.arg(path)));
-    QCOMPARE(logLines(capture, "Tz", RkLogError), listOf(logged));
-    QByteArray back;
-    QCOMPARE(res.isOk() && ZuBase::File::readAll(path, back).isOk() && back == data,
-             record.isEmpty() && logged.isEmpty());
+    QCOMPARE(logLines(capture, "Tz", RkLogError), listOf(logged)); // else only accumulated
+    const bool ok = record.isEmpty() && logged.isEmpty();
+    QCOMPARE(res.isOk(), ok);
+    if (write && ok)
+        QVERIFY(ZuBase::File::readAll(path, buffer).isOk() && buffer == data);
+    else if (!write)
+        QCOMPARE(buffer, ok ? old : QByteArray());
 }
 
 void TestFile::writeAllToDevice()
@@ -219,7 +197,7 @@ void TestFile::removeFile()
     }
 
     RkLogCapture capture;
-    QCOMPARE(ZuBase::File::removeFile(path).isOk(), ok);
+    QVERIFY(ZuBase::File::removeFile(path).isOk() == ok && QFileInfo::exists(path) != ok);
     const QString trace = QString("QFile::remove() [%1] -> %2").arg(path, ok ? "ok" : "fail");
     QCOMPARE(logLines(capture, "ZuBase"), listOf(traced ? trace : ""));
     // A failure is a warning, and reported.
@@ -227,7 +205,6 @@ void TestFile::removeFile()
     QCOMPARE(
         logLines(capture, "Tz"),
         listOf(ok ? "" : kWhere + "removeFile: Internal Error  cond[!QFile::exists(inFilePath)]"));
-    QCOMPARE(QFileInfo::exists(path), !ok);
 }
 
 void TestFile::removeDir_data()
@@ -439,37 +416,27 @@ void TestFile::junctionCreate()
     }
 }
 
-void TestFile::junctionInfo_data()
-{
-    QTest::addColumn<QString>("path");
-    QTest::addColumn<bool>("ok");
-    QTest::addColumn<QString>("target"); // empty: no junction
-    // A link made elsewhere with a relative target reports it from the link's folder.
-    QTest::newRow("link with a relative target") << "relative" << true << "target dir";
-    QTest::newRow("link whose target has gone") << "gone" << true << "removed dir";
-    QTest::newRow("plain folder") << "target dir" << true << "";
-    QTest::newRow("file") << "target dir/file.txt" << false << "";
-    QTest::newRow("empty") << "" << false << "";
-}
-
 void TestFile::junctionInfo()
 {
-    QFETCH(QString, path);
-    QFETCH(bool, ok);
-    QFETCH(QString, target);
+    // "ok|target" of a path; a link made elsewhere with a relative target counts from its
+    // folder, one whose target has gone is still a junction; nothing here is reported.
     QTemporaryDir root;
     makeFile(root.filePath("target dir/file.txt"));
     QVERIFY(QFile::link("target dir", root.filePath("relative")));
     QVERIFY(QFile::link(root.filePath("removed dir"), root.filePath("gone")));
-
     RkLogCapture capture;
-    bool isJunction = true;
-    QString outTarget = "stale";
-    const QString full = path.isEmpty() ? path : root.filePath(path);
-    QCOMPARE(ZuBase::File::junctionInfo(full, isJunction, outTarget).isOk(), ok);
-    QCOMPARE(isJunction, !target.isEmpty());
-    QCOMPARE(outTarget, target.isEmpty() ? QString() : root.filePath(target));
-    QCOMPARE(logLines(capture, "Tz", RkLogError), QStringList()); // none of these is reported
+    const auto info = [&root](const QString& inPath) {
+        bool isJunction = true;
+        QString target = "stale";
+        const bool ok = ZuBase::File::junctionInfo(inPath, isJunction, target).isOk();
+        return QString("%1|%2").arg(ok).arg(isJunction ? target : "no junction " + target);
+    };
+    QCOMPARE(info(root.filePath("relative")), "1|" + root.filePath("target dir"));
+    QCOMPARE(info(root.filePath("gone")), "1|" + root.filePath("removed dir"));
+    QCOMPARE(info(root.filePath("target dir")), "1|no junction ");
+    QCOMPARE(info(root.filePath("target dir/file.txt")), "0|no junction ");
+    QCOMPARE(info(QString()), "0|no junction ");
+    QCOMPARE(logLines(capture, "Tz", RkLogError), QStringList());
 }
 
 void TestFile::pathsPointToTheSameFile()
