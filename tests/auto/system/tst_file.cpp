@@ -351,7 +351,6 @@ void TestFile::junctionCreate_data()
     row("nothing there", "nothing", "target", "", "link");
     row("relative paths made absolute", "nothing", "relative", "", "link");
     row("empty folder replaced", "empty dir", "target", "", "link");
-    row("existing junction replaced", "link", "target", "", "link");
     row("non-empty folder refused", "full dir", "target", io, "full dir");
     row("created folder removed on failure", "nothing", "too long", io, "nothing");
     row("existing folder kept on failure", "empty dir", "too long", io, "empty dir");
@@ -359,7 +358,6 @@ void TestFile::junctionCreate_data()
     row("a file there", "file", "target",
         "::CreateFileW  cond[hDirMountPoint!=((HANDLE)(LONG_PTR)-1)]", "file");
     row("no target", "nothing", "", "", "nothing");
-    row("no junction path", "no path", "target", "", "nothing");
 }
 
 void TestFile::junctionCreate()
@@ -380,8 +378,6 @@ void TestFile::junctionCreate()
         QDir().mkpath(junction);
     else if (before == "full dir")
         makeFile(junction + "/keep.txt");
-    else if (before == "link")
-        QVERIFY(QFile::link(root.path(), junction));
     else if (before == "no parent")
         junction = root.filePath("missing/j");
     else if (before == "file")
@@ -399,7 +395,7 @@ void TestFile::junctionCreate()
         const QString path = target == "too long" ? targetDir + '/' + QString(5000, 'x')
                              : target.isEmpty()   ? QString()
                                                   : targetDir;
-        res = ZuBase::File::junctionCreate(before == "no path" ? QString() : junction, path);
+        res = ZuBase::File::junctionCreate(junction, path);
     }
     QCOMPARE(res.isOk(), after == "link");
     const QStringList failures = logLines(capture, "Tz", RkLogError);
