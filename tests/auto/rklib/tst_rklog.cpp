@@ -104,6 +104,8 @@ void TestRkLog::qualifiedFunctionName_data()
     row("pointer at the name", "char *ZuX::name() const", "ZuX::name");
     row("reference at the name", "int &ZuX::at(int)", "ZuX::at");
     row("no parameter list", "ZuX::value", "ZuX::value");
+    row("call type in a template", "std::function<void(int)> Zu::X::f(int)", "Zu::X::f");
+    row("member of a class template", "void Zu::Pair<A, B>::swap(int)", "Zu::Pair<A, B>::swap");
 }
 
 void TestRkLog::qualifiedFunctionName()
