@@ -1,8 +1,11 @@
 #include "rklib/RkLogFile.h"
 
+#include <atomic>
+#include <cerrno>
 #include <cstdarg>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <ctime>
 #include <map>
 #include <shared_mutex>
@@ -36,6 +39,39 @@ long currentThreadId()
     return long(::syscall(SYS_gettid));
 }
 
+// Control characters written to the output as C escapes (a line feed as backslash and n, an
+// escape character as backslash, x1b), so that one call stays one line there and a logged value
+// can neither forge lines nor drive a terminal. Tabs stay. Sinks and the write callback get the
+// text as it was given.
+std::string escapedControls(const std::string& inText)
+{
+    std::string text;
+    text.reserve(inText.size());
+    for (const char c : inText) {
+        const unsigned char byte = static_cast<unsigned char>(c);
+        if ((byte >= 0x20 && byte != 0x7F) || c == '\t') {
+            text += c;
+        } else if (c == '\n') {
+            text += "\\n";
+        } else if (c == '\r') {
+            text += "\\r";
+        } else {
+            static const char digits[] = "0123456789abcdef";
+            text += "\\x";
+            text += digits[byte >> 4];
+            text += digits[byte & 15];
+        }
+    }
+    return text;
+}
+
+// Says on standard error why a setting of the environment is not used; the log reads the
+// environment once, when it is made.
+void complain(const std::string& inText)
+{
+    std::fprintf(stderr, "zubase: %s\n", inText.c_str());
+}
+
 } // namespace
 
 struct RkLogFile::Private
@@ -43,7 +79,7 @@ struct RkLogFile::Private
     std::mutex outputMutex;
     std::FILE* output = stderr;
     bool ownsOutput = false;
-    RkLogLevel outputLevel = RkLogInfo;
+    std::atomic<RkLogLevel> outputLevel{RkLogInfo}; // read by every write without a lock
 
     std::mutex sinkMutex;
     // Held shared while sinks run, exclusively by removeSink(), so that a removed sink is
@@ -58,12 +94,20 @@ struct RkLogFile::Private
 RkLogFile::RkLogFile() : d(new Private)
 {
     if (const char* level = std::getenv("ZUBASE_LOG_LEVEL"); level && *level) {
-        const int value = std::atoi(level);
-        if (value >= RkLogDebug && value <= RkLogOff)
+        char* end = nullptr;
+        errno = 0;
+        const long value = std::strtol(level, &end, 10);
+        if (errno == 0 && *end == '\0' && value >= RkLogDebug && value <= RkLogOff)
             d->outputLevel = RkLogLevel(value);
+        else
+            complain(std::string("ZUBASE_LOG_LEVEL \"") + level +
+                     "\" is no level from 0 to 5; the log keeps level 1");
     }
-    if (const char* path = std::getenv("ZUBASE_LOG_FILE"); path && *path)
-        setOutputFile(path);
+    if (const char* path = std::getenv("ZUBASE_LOG_FILE"); path && *path) {
+        if (!setOutputFile(path))
+            complain(std::string("cannot open ZUBASE_LOG_FILE \"") + path + "\" (" +
+                     std::strerror(errno) + "); the log goes to standard error");
+    }
 }
 
 RkLogFile::~RkLogFile()
@@ -118,7 +162,7 @@ void RkLogFile::write(RkLogLevel inLevel, const char* inCategory, const std::str
     entry.category = inCategory ? inCategory : "";
     entry.text = inText;
 
-    if (inLevel >= d->outputLevel && inLevel < RkLogOff) {
+    if (inLevel >= d->outputLevel.load() && inLevel < RkLogOff) {
         const std::string line = formatLine(entry) + '\n';
         std::lock_guard<std::mutex> lock(d->outputMutex);
         std::fwrite(line.data(), 1, line.size(), d->output);
@@ -154,20 +198,20 @@ void RkLogFile::setWriteCallback(WriteCallback inCallback, RkLogLevel inLevel)
 
 void RkLogFile::setOutputLevel(RkLogLevel inLevel)
 {
-    std::lock_guard<std::mutex> lock(d->outputMutex);
     d->outputLevel = inLevel;
 }
 
 RkLogLevel RkLogFile::outputLevel() const
 {
-    return d->outputLevel;
+    return d->outputLevel.load();
 }
 
 bool RkLogFile::setOutputFile(const std::string& inPath)
 {
     std::FILE* file = stderr;
     if (!inPath.empty()) {
-        file = std::fopen(inPath.c_str(), "a");
+        // Close-on-exec ("e"): the children the library starts must not inherit the log.
+        file = std::fopen(inPath.c_str(), "ae");
         if (!file)
             return false;
     }
@@ -199,7 +243,7 @@ void RkLogFile::removeSink(int inId)
 
 std::string RkLogFile::formatLine(const RkLogEntry& inEntry)
 {
-    static const char levelLetters[] = "DIWEF-";
+    static const char kLevelLetters[] = "DIWEF-";
     const std::time_t seconds = std::chrono::system_clock::to_time_t(inEntry.time);
     const auto millis =
         std::chrono::duration_cast<std::chrono::milliseconds>(inEntry.time.time_since_epoch())
@@ -212,11 +256,11 @@ std::string RkLogFile::formatLine(const RkLogEntry& inEntry)
         stamp, sizeof stamp, "%04d-%02d-%02d %02d:%02d:%02d.%03d [%ld] %c ", local.tm_year + 1900,
         local.tm_mon + 1, local.tm_mday, local.tm_hour, local.tm_min, local.tm_sec, int(millis),
         inEntry.thread,
-        levelLetters[inEntry.level >= 0 && inEntry.level <= RkLogOff ? inEntry.level : 5]);
+        kLevelLetters[inEntry.level >= 0 && inEntry.level <= RkLogOff ? inEntry.level : 5]);
     std::string line = stamp;
     if (!inEntry.category.empty())
-        line += inEntry.category + ": ";
-    line += inEntry.text;
+        line += escapedControls(inEntry.category) + ": ";
+    line += escapedControls(inEntry.text);
     return line;
 }
 
@@ -290,16 +334,16 @@ std::vector<std::string> RkLogCapture::texts(const std::string& inCategory) cons
 
 std::vector<std::string> RkLogCapture::lines() const
 {
-    static const char levelLetters[] = "DIWEF-";
+    static const char kLevelLetters[] = "DIWEF-";
     std::lock_guard<std::mutex> lock(mMutex);
     std::vector<std::string> result;
     for (const RkLogEntry& entry : mEntries) {
         std::string line(
-            1, levelLetters[entry.level >= 0 && entry.level <= RkLogOff ? entry.level : 5]);
+            1, kLevelLetters[entry.level >= 0 && entry.level <= RkLogOff ? entry.level : 5]);
         line += ' ';
         if (!entry.category.empty())
-            line += entry.category + ": ";
-        result.push_back(line + entry.text);
+            line += escapedControls(entry.category) + ": ";
+        result.push_back(line + escapedControls(entry.text));
     }
     return result;
 }

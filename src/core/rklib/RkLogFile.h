@@ -34,7 +34,11 @@ struct RkLogEntry
 // The process-wide log. Thread-safe; every call writes exactly one line
 // "<time> [<thread>] <level letter> <category>: <text>" (no category: "... <level letter> <text>")
 // to stderr, or to the file named by ZUBASE_LOG_FILE. ZUBASE_LOG_LEVEL (0..5, default 1) is the
-// lowest level written there. Sinks (RkLogCapture in tests) and the write callback see every line.
+// lowest level written there; a value that is no level, or a file that cannot be opened, is
+// said on stderr when the log is made, and the default kept. Control characters are written there
+// as C escapes
+// ("\n", "\x1b"), tabs as they are, so one call stays one line. Sinks (RkLogCapture in tests)
+// and the write callback see every entry with its text as it was given.
 class RKLIB_EXPORT RkLogFile
 {
 public:
@@ -115,7 +119,8 @@ public:
     // Texts of the captured lines, optionally only those of one category.
     std::vector<std::string> texts() const;
     std::vector<std::string> texts(const std::string& inCategory) const;
-    // Whole formatted lines as the output shows them, without the time and thread columns.
+    // Whole formatted lines as the output shows them (control characters escaped), without the
+    // time and thread columns.
     std::vector<std::string> lines() const;
     void clear();
 

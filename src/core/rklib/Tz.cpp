@@ -8,12 +8,12 @@
 
 namespace {
 
-const char* const sCategory = "Tz";
+const char* const kCategory = "Tz";
 
 void logRecords(const RkResult& inResult)
 {
     for (const RkResult::Record& record : inResult.records()) {
-        getTheLogInstance().tracef(RkLogError, sCategory, "%s(%d): %s  %s", record.where.c_str(),
+        getTheLogInstance().tracef(RkLogError, kCategory, "%s(%d): %s  %s", record.where.c_str(),
                                    record.line, record.message.c_str(), record.detail.c_str());
     }
 }
@@ -48,7 +48,7 @@ bool failWin(const RkResult& inResult, int inError)
     if (inResult.isOk())
         return false;
     logRecords(inResult);
-    getTheLogInstance().tracef(RkLogError, sCategory, "last error %d: %s", inError,
+    getTheLogInstance().tracef(RkLogError, kCategory, "last error %d: %s", inError,
                                errorText(inError).c_str());
     return true;
 }
@@ -65,11 +65,11 @@ bool logWinFunc(std::int64_t inValue, std::int64_t inExpected, const char* inFun
     const std::string context = inContext && *inContext ? std::string(" ") + inContext : "";
     const char* function = inFunction ? inFunction : "";
     if (inValue == inExpected) {
-        getTheLogInstance().tracef(inChangesIdentity ? RkLogInfo : RkLogDebug, sCategory,
+        getTheLogInstance().tracef(inChangesIdentity ? RkLogInfo : RkLogDebug, kCategory,
                                    "%s%s -> ok", function, context.c_str());
         return false;
     }
-    getTheLogInstance().tracef(RkLogError, sCategory, "%s%s -> %lld, last error %d: %s", function,
+    getTheLogInstance().tracef(RkLogError, kCategory, "%s%s -> %lld, last error %d: %s", function,
                                context.c_str(), static_cast<long long>(inValue), inError,
                                errorText(inError).c_str());
     return true;

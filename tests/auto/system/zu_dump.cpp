@@ -1,6 +1,6 @@
 // Test helper: zu_dump <output file> <exit code> [arguments...]
 // Writes its working directory, arguments, environment and which standard descriptors are open
-// to the output file (complete or not at all), then exits with the given code.
+// (or lead to /dev/null) to the output file (complete or not at all), then exits with the code.
 #include <cstdio>
 #include <cstdlib>
 #include <string>
@@ -14,8 +14,15 @@ int main(int argc, char** argv)
 {
     // Before anything opens a descriptor that could take a free standard number.
     std::string fds;
-    for (int fd = 0; fd < 3; ++fd)
-        fds += std::to_string(fd) + (fcntl(fd, F_GETFD) == -1 ? ":closed " : ":open ");
+    for (int fd = 0; fd < 3; ++fd) {
+        char target[64] = {};
+        const std::string link = "/proc/self/fd/" + std::to_string(fd);
+        const bool null = readlink(link.c_str(), target, sizeof target - 1) > 0 &&
+                          std::string(target) == "/dev/null";
+        fds += std::to_string(fd) + (fcntl(fd, F_GETFD) == -1 ? ":closed "
+                                     : null                   ? ":null "
+                                                              : ":open ");
+    }
     if (argc < 3)
         return 2;
     const std::string target = argv[1];

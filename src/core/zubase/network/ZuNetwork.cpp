@@ -27,8 +27,8 @@ QString getPeerName(int inSocket)
             ip4 = (ip4 << 8) | peer.bytes[i];
         return QHostAddress(ip4).toString();
     }
-    static const quint8 sMappedPrefix[12] = {0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0xFF, 0xFF};
-    if (std::equal(sMappedPrefix, sMappedPrefix + 12, peer.bytes)) {
+    static const quint8 kMappedPrefix[12] = {0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0xFF, 0xFF};
+    if (std::equal(kMappedPrefix, kMappedPrefix + 12, peer.bytes)) {
         quint32 ip4 = 0;
         for (int i = 12; i < 16; ++i)
             ip4 = (ip4 << 8) | peer.bytes[i];

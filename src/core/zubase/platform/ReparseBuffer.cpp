@@ -4,7 +4,7 @@ namespace ZuPlatform {
 
 namespace {
 
-const std::u16string sNtPrefix = u"\\??\\";
+const std::u16string kNtPrefix = u"\\??\\";
 
 void put16(std::vector<std::uint8_t>& ioBuffer, std::size_t inOffset, std::uint32_t inValue)
 {
@@ -22,7 +22,7 @@ std::uint32_t get16(const std::uint8_t* inData, std::size_t inOffset)
 
 std::u16string mountPointSubstituteName(const std::u16string& inTarget)
 {
-    std::u16string name = sNtPrefix + inTarget;
+    std::u16string name = kNtPrefix + inTarget;
     if (name.back() != u'\\')
         name += u'\\';
     return name;
@@ -31,8 +31,8 @@ std::u16string mountPointSubstituteName(const std::u16string& inTarget)
 std::u16string mountPointTarget(const std::u16string& inSubstituteName)
 {
     std::u16string target = inSubstituteName;
-    if (target.compare(0, sNtPrefix.size(), sNtPrefix) == 0)
-        target.erase(0, sNtPrefix.size());
+    if (target.compare(0, kNtPrefix.size(), kNtPrefix) == 0)
+        target.erase(0, kNtPrefix.size());
     const bool driveRoot = target.size() >= 2 && target.compare(target.size() - 2, 2, u":\\") == 0;
     if (!target.empty() && target.back() == u'\\' && !driveRoot)
         target.pop_back();

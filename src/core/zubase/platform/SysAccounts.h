@@ -6,7 +6,8 @@
 // On Linux an account is logged on through PAM; its token carries the user id, the primary
 // group id and the supplementary groups. Impersonation changes only the calling thread's
 // effective user, group and supplementary groups (the kernel keeps credentials per thread).
-// Privileges are capabilities of the calling thread; the "process token" stands for it.
+// Privileges are capabilities, which the kernel keeps per thread; the "process token" reads the
+// calling thread's and changes those of every thread.
 
 #include <cstddef>
 #include <cstdint>
@@ -86,9 +87,11 @@ int accountsGetTokenInformation(const AccountToken* inToken, TokenInformation in
 int accountsLookupPrivilegeValue(const std::string& inName, std::uint32_t& outPrivilege);
 int accountsLookupPrivilegeName(std::uint32_t inPrivilege, std::string& outName);
 // With kPrivilegeEnabled raises the privilege in the effective set; one that the token does not
-// hold (or any, while the thread impersonates) stays absent without a failure, as the system
+// hold (or any, for a thread that impersonates) stays absent without a failure, as the system
 // leaves unassigned privileges. With kPrivilegeRemoved drops it from the effective, permitted
-// and inheritable sets for good.
+// and inheritable sets for good. Through the process token the change reaches every thread of
+// the process, also those that were running before; EAGAIN when a thread that blocks signals
+// could not be reached in time.
 int accountsAdjustPrivilege(AccountToken* inToken, std::uint32_t inPrivilege,
                             std::uint32_t inAttributes);
 

@@ -1,16 +1,22 @@
 #include "zubase/platform/SysAccounts.h"
 
+#include <atomic>
 #include <cerrno>
+#include <chrono>
 #include <cstdlib>
 #include <cstring>
+#include <dirent.h>
 #include <grp.h>
+#include <linux/capability.h>
 #include <mutex>
 #include <pwd.h>
 #include <security/pam_appl.h>
 #include <set>
+#include <signal.h>
 #include <strings.h>
 #include <sys/capability.h>
 #include <sys/syscall.h>
+#include <thread>
 #include <unistd.h>
 
 namespace ZuPlatform {
@@ -35,6 +41,8 @@ struct SavedIdentity
     std::vector<gid_t> groups;
 };
 thread_local SavedIdentity tSaved;
+// Whether the thread impersonates, apart from tSaved so that a signal handler may read it.
+thread_local bool tImpersonating __attribute__((tls_model("initial-exec"))) = false;
 
 // Live tokens: a handle that was never handed out or is already closed is refused, as the
 // system refuses an invalid handle, instead of being dereferenced.
@@ -69,6 +77,14 @@ int threadSetResUid(uid_t inReal, uid_t inEffective, uid_t inSaved)
     return ::syscall(SYS_setresuid, inReal, inEffective, inSaved) == 0 ? 0 : errno;
 }
 
+// Puts the saved groups back; the first error wins.
+int restoreGroups(const SavedIdentity& inSaved)
+{
+    const int error = threadSetResGid(inSaved.rgid, inSaved.egid, inSaved.sgid);
+    const int groupsError = threadSetGroups(inSaved.groups);
+    return error != 0 ? error : groupsError;
+}
+
 std::vector<gid_t> currentGroups()
 {
     const int count = ::getgroups(0, nullptr);
@@ -86,7 +102,7 @@ struct PrivilegeName
     cap_value_t capability;
 };
 // The capabilities that do the work of the account privileges of the same purpose.
-const PrivilegeName sPrivilegeNames[] = {
+const PrivilegeName kPrivilegeNames[] = {
     {"SeBackupPrivilege", CAP_DAC_READ_SEARCH}, {"SeRestorePrivilege", CAP_DAC_OVERRIDE},
     {"SeTakeOwnershipPrivilege", CAP_CHOWN},    {"SeSecurityPrivilege", CAP_FOWNER},
     {"SeShutdownPrivilege", CAP_SYS_BOOT},      {"SeSystemtimePrivilege", CAP_SYS_TIME},
@@ -165,12 +181,32 @@ int pamError(int inCode)
     }
 }
 
+// Runs an account lookup (getpwnam_r, getpwuid_r, getgrgid_r) with a buffer that grows while
+// the entry does not fit: groups with long member lists and accounts with long comments need
+// more than the usual size.
+template <typename Entry, typename Lookup>
+int lookupEntry(Lookup inLookup, Entry& outEntry, std::vector<char>& outBuffer, Entry*& outFound)
+{
+    constexpr std::size_t kFirstSize = 16384;
+    constexpr std::size_t kLargestSize = std::size_t(1) << 24;
+    outBuffer.resize(kFirstSize);
+    int rc;
+    while ((rc = inLookup(&outEntry, outBuffer.data(), outBuffer.size(), &outFound)) == ERANGE &&
+           outBuffer.size() < kLargestSize)
+        outBuffer.resize(outBuffer.size() * 2);
+    return rc;
+}
+
 int accountOf(const std::string& inUser, AccountToken& outToken)
 {
-    std::vector<char> buffer(16384);
+    std::vector<char> buffer;
     passwd entry;
     passwd* found = nullptr;
-    const int rc = ::getpwnam_r(inUser.c_str(), &entry, buffer.data(), buffer.size(), &found);
+    const int rc = lookupEntry(
+        [&inUser](passwd* outEntry, char* outText, std::size_t inSize, passwd** outFound) {
+            return ::getpwnam_r(inUser.c_str(), outEntry, outText, inSize, outFound);
+        },
+        entry, buffer, found);
     if (rc != 0)
         return rc;
     if (!found)
@@ -190,6 +226,140 @@ int accountOf(const std::string& inUser, AccountToken& outToken)
             outToken.groups.push_back(group);
     }
     return 0;
+}
+
+// The kernel keeps capabilities per thread, while the process token covers every thread: a
+// change through it reaches each thread by a signal whose handler applies it to that thread.
+// (libpsx does this only for threads started through its wrapped pthread_create, which misses
+// those that libstdc++ and Qt start.) Each thread applies the change to its own sets, so an
+// impersonating thread, whose effective set the identity change emptied, gains nothing.
+std::atomic<std::uint64_t> sRemovedCapabilities{0}; // dropped for good by every thread
+std::atomic<int> sEnabledCapability{-1};            // raised by the broadcast under way
+std::atomic<int> sBroadcast{0};                     // number of the broadcast under way
+std::atomic<int> sAnswers{0};
+std::atomic<int> sFailures{0};
+std::mutex sBroadcastMutex;
+
+int broadcastSignal()
+{
+    return SIGRTMIN + 9;
+}
+
+// Async-signal-safe: raw system calls only.
+int applyToThisThread(int inEnabled)
+{
+    __user_cap_header_struct header{_LINUX_CAPABILITY_VERSION_3, 0};
+    __user_cap_data_struct data[_LINUX_CAPABILITY_U32S_3];
+    if (::syscall(SYS_capget, &header, data) != 0)
+        return errno;
+    const std::uint64_t removed = sRemovedCapabilities.load();
+    bool change = false;
+    for (int word = 0; word < _LINUX_CAPABILITY_U32S_3; ++word) {
+        const std::uint32_t mask = static_cast<std::uint32_t>(removed >> (32 * word));
+        change = change ||
+                 ((data[word].effective | data[word].permitted | data[word].inheritable) & mask);
+        data[word].effective &= ~mask;
+        data[word].permitted &= ~mask;
+        data[word].inheritable &= ~mask;
+    }
+    // An impersonating thread acts as the account, which holds no privileges.
+    if (inEnabled >= 0 && !tImpersonating) {
+        __user_cap_data_struct& word = data[inEnabled / 32];
+        const std::uint32_t bit = 1u << (inEnabled % 32);
+        if ((word.permitted & bit) && !(word.effective & bit)) {
+            word.effective |= bit;
+            change = true;
+        }
+    }
+    if (!change)
+        return 0;
+    return ::syscall(SYS_capset, &header, data) == 0 ? 0 : errno;
+}
+
+void onBroadcast(int, siginfo_t* inInfo, void*)
+{
+    const int savedErrno = errno;
+    if (inInfo->si_code == SI_QUEUE && inInfo->si_pid == ::getpid()) {
+        // A late signal of an earlier broadcast still drops what was removed, nothing more.
+        const bool current = inInfo->si_value.sival_int == sBroadcast.load();
+        const int error = applyToThisThread(current ? sEnabledCapability.load() : -1);
+        if (current) {
+            if (error != 0)
+                sFailures.fetch_add(1);
+            sAnswers.fetch_add(1);
+        }
+    }
+    errno = savedErrno;
+}
+
+std::vector<pid_t> threadsOfProcess()
+{
+    std::vector<pid_t> threads;
+    if (DIR* dir = ::opendir("/proc/self/task")) {
+        while (const dirent* entry = ::readdir(dir)) {
+            if (entry->d_name[0] != '.')
+                threads.push_back(static_cast<pid_t>(std::atoi(entry->d_name)));
+        }
+        ::closedir(dir);
+    }
+    return threads;
+}
+
+// Applies the change to this thread, then to every other one; threads that start meanwhile are
+// found on the next look. EAGAIN when a thread did not answer in time (it blocks the signal;
+// it still drops a removed privilege once it takes the signal).
+int changeProcessCapability(int inCapability, bool inRemove)
+{
+    std::lock_guard<std::mutex> lock(sBroadcastMutex);
+    static const bool handlerInstalled = [] {
+        struct sigaction action;
+        std::memset(&action, 0, sizeof action);
+        action.sa_sigaction = &onBroadcast;
+        action.sa_flags = SA_SIGINFO | SA_RESTART;
+        sigemptyset(&action.sa_mask);
+        return ::sigaction(broadcastSignal(), &action, nullptr) == 0;
+    }();
+    if (inRemove)
+        sRemovedCapabilities.fetch_or(std::uint64_t(1) << inCapability);
+    const int enabled = inRemove ? -1 : inCapability;
+    if (const int error = applyToThisThread(enabled))
+        return error;
+    if (!handlerInstalled)
+        return ENOSYS;
+
+    sEnabledCapability = enabled;
+    const int broadcast = sBroadcast.fetch_add(1) + 1;
+    sAnswers = 0;
+    sFailures = 0;
+    const pid_t process = ::getpid();
+    std::set<pid_t> asked{static_cast<pid_t>(::syscall(SYS_gettid))};
+    int sent = 0;
+    const auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(2);
+    bool lookAgain = true;
+    while (lookAgain && std::chrono::steady_clock::now() < deadline) {
+        lookAgain = false;
+        for (pid_t thread : threadsOfProcess()) {
+            if (!asked.insert(thread).second)
+                continue;
+            siginfo_t info;
+            std::memset(&info, 0, sizeof info);
+            info.si_signo = broadcastSignal();
+            info.si_code = SI_QUEUE;
+            info.si_pid = process;
+            info.si_uid = ::getuid();
+            info.si_value.sival_int = broadcast;
+            if (::syscall(SYS_rt_tgsigqueueinfo, process, thread, broadcastSignal(), &info) == 0) {
+                ++sent;
+                lookAgain = true;
+            }
+        }
+        while (sAnswers.load() < sent && std::chrono::steady_clock::now() < deadline)
+            std::this_thread::sleep_for(std::chrono::microseconds(200));
+    }
+    sEnabledCapability = -1;
+    if (sAnswers.load() < sent)
+        return EAGAIN;
+    return sFailures.load() == 0 ? 0 : EPERM;
 }
 
 } // namespace
@@ -274,19 +444,18 @@ int accountsImpersonate(const AccountToken* inToken)
     const uid_t unchangedUid = static_cast<uid_t>(-1);
     if (const int error = threadSetGroups(inToken->groups))
         return error;
-    if (const int error = threadSetResGid(unchangedGid, inToken->gid, unchangedGid)) {
-        threadSetGroups(saved.groups);
-        return error;
-    }
-    // Only the effective user changes: the saved user keeps the way back, and the permitted
-    // capabilities stay (out of effect) for it.
-    if (const int error = threadSetResUid(unchangedUid, inToken->uid, unchangedUid)) {
-        threadSetResGid(saved.rgid, saved.egid, saved.sgid);
-        threadSetGroups(saved.groups);
+    // Only the effective group and user change: the saved ones keep the way back, and the
+    // permitted capabilities stay (out of effect) for it.
+    int error = threadSetResGid(unchangedGid, inToken->gid, unchangedGid);
+    if (error == 0)
+        error = threadSetResUid(unchangedUid, inToken->uid, unchangedUid);
+    if (error != 0) {
+        restoreGroups(saved);
         return error;
     }
     saved.impersonating = true;
     tSaved = std::move(saved);
+    tImpersonating = true;
     return 0;
 }
 
@@ -297,10 +466,9 @@ int accountsRevertToSelf()
     // The user first: becoming the own user again brings back the privileges for the rest.
     if (const int error = threadSetResUid(tSaved.ruid, tSaved.euid, tSaved.suid))
         return error;
-    int error = threadSetResGid(tSaved.rgid, tSaved.egid, tSaved.sgid);
-    if (const int groupsError = threadSetGroups(tSaved.groups); !error)
-        error = groupsError;
+    const int error = restoreGroups(tSaved);
     tSaved = SavedIdentity();
+    tImpersonating = false;
     return error;
 }
 
@@ -366,7 +534,7 @@ int accountsGetTokenInformation(const AccountToken* inToken, TokenInformation in
 int accountsLookupPrivilegeValue(const std::string& inName, std::uint32_t& outPrivilege)
 {
     outPrivilege = 0;
-    for (const PrivilegeName& entry : sPrivilegeNames) {
+    for (const PrivilegeName& entry : kPrivilegeNames) {
         if (::strcasecmp(entry.name, inName.c_str()) == 0) {
             outPrivilege = static_cast<std::uint32_t>(entry.capability);
             return 0;
@@ -385,7 +553,7 @@ int accountsLookupPrivilegeName(std::uint32_t inPrivilege, std::string& outName)
     outName.clear();
     if (inPrivilege > static_cast<std::uint32_t>(CAP_LAST_CAP))
         return EINVAL;
-    for (const PrivilegeName& entry : sPrivilegeNames) {
+    for (const PrivilegeName& entry : kPrivilegeNames) {
         if (static_cast<std::uint32_t>(entry.capability) == inPrivilege) {
             outName = entry.name;
             return 0;
@@ -406,36 +574,12 @@ int accountsAdjustPrivilege(AccountToken* inToken, std::uint32_t inPrivilege,
         return EBADF;
     if (inPrivilege > static_cast<std::uint32_t>(CAP_LAST_CAP))
         return EINVAL;
-    const bool remove = (inAttributes & kPrivilegeRemoved) != 0;
     // As with account tokens elsewhere, a privilege that is not held is simply not assigned:
     // that is no failure, the privilege just stays absent.
     if (!inToken->process)
         return 0; // a logged-on account holds no capabilities
-    // An impersonating thread must not gain privileges through the process token.
-    if (!remove && tSaved.impersonating)
-        return 0;
-    cap_t caps = ::cap_get_proc();
-    if (!caps)
-        return errno;
-    const cap_value_t cap = static_cast<cap_value_t>(inPrivilege);
-    int error = 0;
-    bool change = true;
-    if (remove) {
-        ::cap_set_flag(caps, CAP_EFFECTIVE, 1, &cap, CAP_CLEAR);
-        ::cap_set_flag(caps, CAP_PERMITTED, 1, &cap, CAP_CLEAR);
-        ::cap_set_flag(caps, CAP_INHERITABLE, 1, &cap, CAP_CLEAR);
-    } else {
-        cap_flag_value_t permitted = CAP_CLEAR;
-        ::cap_get_flag(caps, cap, CAP_PERMITTED, &permitted);
-        change = permitted == CAP_SET;
-        if (change)
-            ::cap_set_flag(caps, CAP_EFFECTIVE, 1, &cap, CAP_SET);
-    }
-    // cap_set_proc() sets the calling thread's capabilities.
-    if (change && ::cap_set_proc(caps) != 0)
-        error = errno;
-    ::cap_free(caps);
-    return error;
+    const bool remove = (inAttributes & kPrivilegeRemoved) != 0;
+    return changeProcessCapability(static_cast<int>(inPrivilege), remove);
 }
 
 namespace {
@@ -445,14 +589,14 @@ template <typename Id, typename Entry>
 int lookupName(int (*inLookup)(Id, Entry*, char*, std::size_t, Entry**), char* Entry::*inName,
                Id inId, const char* inDomain, std::string& outDomain, std::string& outName)
 {
-    // Groups with long member lists need more than the usual buffer: grow it on ERANGE.
-    std::vector<char> buffer(16384);
+    std::vector<char> buffer;
     Entry entry;
     Entry* found = nullptr;
-    int rc;
-    while ((rc = inLookup(inId, &entry, buffer.data(), buffer.size(), &found)) == ERANGE &&
-           buffer.size() < (std::size_t(1) << 24))
-        buffer.resize(buffer.size() * 2);
+    const int rc = lookupEntry(
+        [&](Entry* outEntry, char* outText, std::size_t inSize, Entry** outFound) {
+            return inLookup(inId, outEntry, outText, inSize, outFound);
+        },
+        entry, buffer, found);
     if (rc != 0)
         return rc;
     if (!found)

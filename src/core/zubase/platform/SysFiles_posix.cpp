@@ -4,6 +4,7 @@
 
 #include <cerrno>
 #include <climits>
+#include <dirent.h>
 #include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -73,6 +74,72 @@ std::string fromUtf16(const std::u16string& inText)
 }
 
 } // namespace
+
+int filesOpenFolder(FolderHandle inParent, const std::string& inName, FolderHandle& outFolder)
+{
+    outFolder = kInvalidHandle;
+    const int parent = inParent == kInvalidHandle ? AT_FDCWD : static_cast<int>(inParent);
+    const int fd =
+        ::openat(parent, inName.c_str(), O_RDONLY | O_DIRECTORY | O_NOFOLLOW | O_CLOEXEC);
+    if (fd < 0)
+        return errno;
+    outFolder = fd;
+    return 0;
+}
+
+void filesCloseFolder(FolderHandle inFolder)
+{
+    if (inFolder != kInvalidHandle)
+        ::close(static_cast<int>(inFolder));
+}
+
+int filesListFolder(FolderHandle inFolder, std::vector<FolderEntry>& outEntries)
+{
+    outEntries.clear();
+    // The listing reads through a descriptor of its own: closedir() closes it.
+    const int listing = ::fcntl(static_cast<int>(inFolder), F_DUPFD_CLOEXEC, 3);
+    if (listing < 0)
+        return errno;
+    DIR* dir = ::fdopendir(listing);
+    if (!dir) {
+        const int error = errno;
+        ::close(listing);
+        return error;
+    }
+    ::rewinddir(dir);
+    while (const dirent* item = ::readdir(dir)) {
+        const std::string name = item->d_name;
+        if (name == "." || name == "..")
+            continue;
+        struct stat info;
+        EntryKind kind = EntryKind::File;
+        if (::fstatat(static_cast<int>(inFolder), name.c_str(), &info, AT_SYMLINK_NOFOLLOW) == 0) {
+            if (S_ISDIR(info.st_mode))
+                kind = EntryKind::Folder;
+            else if (S_ISLNK(info.st_mode) &&
+                     ::fstatat(static_cast<int>(inFolder), name.c_str(), &info, 0) == 0 &&
+                     S_ISDIR(info.st_mode))
+                kind = EntryKind::LinkToFolder;
+        }
+        outEntries.push_back({name, kind});
+    }
+    ::closedir(dir);
+    return 0;
+}
+
+int filesRemoveEntry(FolderHandle inFolder, const std::string& inName, bool inFolderEntry)
+{
+    return ::unlinkat(static_cast<int>(inFolder), inName.c_str(),
+                      inFolderEntry ? AT_REMOVEDIR : 0) == 0
+               ? 0
+               : errno;
+}
+
+bool filesEntryExists(FolderHandle inFolder, const std::string& inName)
+{
+    struct stat info;
+    return ::fstatat(static_cast<int>(inFolder), inName.c_str(), &info, AT_SYMLINK_NOFOLLOW) == 0;
+}
 
 int filesCreateDirectory(const std::string& inPath)
 {

@@ -2,18 +2,20 @@
 
 // Internal platform layer of ZuBase::Pipe: a named pipe is a Unix-domain stream socket in a
 // directory that only the user can enter, guarded by a lock file that its live server holds.
-// Qt-free; every call returns 0 or an errno-style code. Handles are small numbers owned by this
-// layer; InvalidPipe marks none.
+// Qt-free; every call returns 0 or an errno-style code. A pipe that is not open is
+// kInvalidHandle, as for CreateNamedPipe and CreateFile.
 
-#include <cstdint>
+#include "zubase/platform/SysTypes.h"
+
 #include <string>
 
 namespace ZuPlatform {
 
-using PipeHandle = std::intptr_t;
-constexpr PipeHandle InvalidPipe = -1;
+using PipeHandle = Handle;
 
 // The socket file of a system pipe name ("\\.\pipe\<name>"); creates the per-user directory.
+// <dir>/<name>.pipe with the name's bytes other than letters, digits, '.', '_' and '-' as %XX;
+// a name too long for a socket path becomes '~' and 32 hex digits of its SHA-256.
 int pipeSocketPath(const std::string& inSystemName, std::string& outPath);
 
 // The server end, one instance: EADDRINUSE while a live server of that name exists. A socket

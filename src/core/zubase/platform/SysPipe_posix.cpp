@@ -2,7 +2,10 @@
 #include "zubase/platform/SysPipe.h"
 
 #include "zubase/platform/HandleTable.h"
+#include "zubase/platform/Sha256.h"
+#include "zubase/platform/UniqueFd.h"
 
+#include <array>
 #include <atomic>
 #include <cerrno>
 #include <chrono>
@@ -22,7 +25,7 @@ namespace ZuPlatform {
 
 namespace {
 
-const char* const sSystemPrefix = "\\\\.\\pipe\\";
+const char* const kSystemPrefix = "\\\\.\\pipe\\";
 
 // Descriptors are closed only when the last transfer using them has returned, so that a
 // descriptor number is never reused under a blocked call.
@@ -30,15 +33,16 @@ struct PipeObject
 {
     ~PipeObject()
     {
-        for (int fd : {listenFd.load(), connFd.load(), lockFd})
-            if (fd >= 0)
+        for (int fd : {listenFd.load(), connFd.load()})
+            if (fd != UniqueFd::kNone)
                 ::close(fd);
     }
     bool server = false;
     std::mutex mutex; // serialises accepting and closing
-    std::atomic<int> listenFd{-1};
-    std::atomic<int> connFd{-1};
-    int lockFd = -1;
+    // Set once, read by transfers in other threads: atomic rather than UniqueFd.
+    std::atomic<int> listenFd{UniqueFd::kNone};
+    std::atomic<int> connFd{UniqueFd::kNone};
+    UniqueFd lockFd;
     std::atomic<bool> closed{false};
     std::string socketPath;
     std::string lockPath;
@@ -86,18 +90,24 @@ int pipeDirectory(std::string& outPath)
     return ownPrivateDirectory(outPath, true);
 }
 
-std::string encodedName(const std::string& inSystemName)
+std::string shortName(const std::string& inSystemName)
 {
     std::string name = inSystemName;
-    if (name.compare(0, std::strlen(sSystemPrefix), sSystemPrefix) == 0)
-        name.erase(0, std::strlen(sSystemPrefix));
+    if (name.compare(0, std::strlen(kSystemPrefix), kSystemPrefix) == 0)
+        name.erase(0, std::strlen(kSystemPrefix));
+    return name;
+}
+
+// The name as a file name: letters, digits, '.', '_' and '-' as they are, other bytes as %XX.
+std::string encodedName(const std::string& inName)
+{
+    static const char digits[] = "0123456789ABCDEF";
     std::string encoded;
-    for (unsigned char c : name) {
+    for (unsigned char c : inName) {
         if ((c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') ||
             c == '.' || c == '_' || c == '-') {
             encoded += static_cast<char>(c);
         } else {
-            static const char digits[] = "0123456789ABCDEF";
             encoded += '%';
             encoded += digits[c >> 4];
             encoded += digits[c & 15];
@@ -106,16 +116,31 @@ std::string encodedName(const std::string& inSystemName)
     return encoded;
 }
 
+// A name whose socket path would not fit sun_path gets '~' and 128 bits of its SHA-256. The
+// encoding never leaves a '~', so such names cannot meet the encoded ones.
+std::string hashedName(const std::string& inName)
+{
+    static const char digits[] = "0123456789abcdef";
+    const std::array<std::uint8_t, 32> digest = sha256(inName);
+    std::string hashed = "~";
+    for (int i = 0; i < 16; ++i) {
+        hashed += digits[digest[i] >> 4];
+        hashed += digits[digest[i] & 15];
+    }
+    return hashed;
+}
+
 int paths(const std::string& inSystemName, std::string& outSocket, std::string& outLock)
 {
     std::string dir;
     if (const int error = pipeDirectory(dir))
         return error;
-    const std::string base = dir + "/" + encodedName(inSystemName);
+    const std::string name = shortName(inSystemName);
+    std::string base = dir + "/" + encodedName(name);
+    if (base.size() + std::strlen(".pipe") >= sizeof(sockaddr_un::sun_path))
+        base = dir + "/" + hashedName(name);
     outSocket = base + ".pipe";
     outLock = base + ".lock";
-    if (outSocket.size() >= sizeof(sockaddr_un::sun_path))
-        return ENAMETOOLONG;
     return 0;
 }
 
@@ -143,36 +168,28 @@ bool serverIsLive(const std::string& inSocketPath, const std::string& inLockPath
     struct stat info;
     if (stat(inSocketPath.c_str(), &info) != 0 || !S_ISSOCK(info.st_mode))
         return false;
-    const int fd = open(inLockPath.c_str(), O_RDONLY | O_CLOEXEC | O_NOFOLLOW);
-    if (fd < 0)
-        return false;
+    const UniqueFd lock(open(inLockPath.c_str(), O_RDONLY | O_CLOEXEC | O_NOFOLLOW));
     flock probe = wholeFile(F_RDLCK);
-    const bool held = fcntl(fd, F_OFD_GETLK, &probe) == 0 && probe.l_type != F_UNLCK;
-    ::close(fd);
-    return held;
+    return lock.isOpen() && fcntl(lock.get(), F_OFD_GETLK, &probe) == 0 && probe.l_type != F_UNLCK;
 }
 
 // Takes the server lock; EADDRINUSE while another live server holds it.
-int takeServerLock(const std::string& inLockPath, int& outFd)
+int takeServerLock(const std::string& inLockPath, UniqueFd& outLock)
 {
     for (int attempt = 0; attempt < 10; ++attempt) {
-        const int fd = open(inLockPath.c_str(), O_RDWR | O_CREAT | O_CLOEXEC | O_NOFOLLOW, 0600);
-        if (fd < 0)
+        UniqueFd lock(open(inLockPath.c_str(), O_RDWR | O_CREAT | O_CLOEXEC | O_NOFOLLOW, 0600));
+        if (!lock.isOpen())
             return errno;
         flock range = wholeFile(F_WRLCK);
-        if (fcntl(fd, F_OFD_SETLK, &range) != 0) {
-            const int error = errno;
-            ::close(fd);
-            return error == EAGAIN || error == EACCES ? EADDRINUSE : error;
-        }
+        if (fcntl(lock.get(), F_OFD_SETLK, &range) != 0)
+            return errno == EAGAIN || errno == EACCES ? EADDRINUSE : errno;
         // A closing server unlinks the file: a lock on an unlinked file guards nothing.
         struct stat held, named;
-        if (fstat(fd, &held) == 0 && stat(inLockPath.c_str(), &named) == 0 &&
+        if (fstat(lock.get(), &held) == 0 && stat(inLockPath.c_str(), &named) == 0 &&
             held.st_dev == named.st_dev && held.st_ino == named.st_ino) {
-            outFd = fd;
+            outLock = std::move(lock);
             return 0;
         }
-        ::close(fd);
     }
     return EAGAIN;
 }
@@ -206,7 +223,7 @@ int pipeSocketPath(const std::string& inSystemName, std::string& outPath)
 
 int createNamedPipe(const std::string& inSystemName, PipeHandle& outPipe)
 {
-    outPipe = InvalidPipe;
+    outPipe = kInvalidHandle;
     auto object = std::make_shared<PipeObject>();
     object->server = true;
     if (const int error = paths(inSystemName, object->socketPath, object->lockPath))
@@ -219,10 +236,12 @@ int createNamedPipe(const std::string& inSystemName, PipeHandle& outPipe)
     const int fd = socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0);
     if (fd < 0)
         return errno;
-    object->listenFd = fd;
+    object->listenFd = fd; // closed with the object
     const sockaddr_un address = addressOf(object->socketPath);
+    // A backlog of 0 queues exactly one connection: the one instance. A second client that
+    // comes before the accept finds the queue full and is told that the pipe is busy.
     if (bind(fd, reinterpret_cast<const sockaddr*>(&address), sizeof address) != 0 ||
-        listen(fd, 1) != 0) {
+        listen(fd, 0) != 0) {
         const int error = errno;
         unlink(object->socketPath.c_str());
         unlink(object->lockPath.c_str());
@@ -241,14 +260,14 @@ int connectNamedPipe(PipeHandle inPipe, int inTimeoutMs)
     if (object->closed)
         return EBADF;
     short events = 0;
-    if (const int conn = object->connFd; conn >= 0) {
+    if (const int conn = object->connFd; conn != UniqueFd::kNone) {
         // Connected already; a client that has gone leaves the pipe unusable.
         if (const int error = pollOne(conn, 0, 0, events))
             return error;
         return events & (POLLHUP | POLLERR) ? EPIPE : 0;
     }
     const int listener = object->listenFd;
-    if (listener < 0)
+    if (listener == UniqueFd::kNone)
         return EBADF;
     if (const int error = pollOne(listener, POLLIN, inTimeoutMs, events))
         return error;
@@ -282,7 +301,7 @@ int waitNamedPipe(const std::string& inSystemName, int inTimeoutMs)
 
 int openNamedPipeForReading(const std::string& inSystemName, PipeHandle& outPipe)
 {
-    outPipe = InvalidPipe;
+    outPipe = kInvalidHandle;
     auto object = std::make_shared<PipeObject>();
     if (const int error = paths(inSystemName, object->socketPath, object->lockPath))
         return error;
@@ -290,7 +309,7 @@ int openNamedPipeForReading(const std::string& inSystemName, PipeHandle& outPipe
     const int fd = socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0);
     if (fd < 0)
         return errno;
-    object->connFd = fd;
+    object->connFd = fd; // closed with the object
     const sockaddr_un address = addressOf(object->socketPath);
     if (connect(fd, reinterpret_cast<const sockaddr*>(&address), sizeof address) != 0) {
         const int error = errno;
@@ -316,7 +335,7 @@ int transfer(PipeHandle inPipe, bool inWriting, unsigned inSize, unsigned& outDo
     if (!object || (inWriting && !object->server))
         return EBADF; // also a write on the client end, which is opened for reading only
     const int fd = object->connFd;
-    if (fd < 0)
+    if (fd == UniqueFd::kNone)
         return ENOTCONN;
     if (inSize == 0)
         return 0;
@@ -362,16 +381,16 @@ int closePipe(PipeHandle inPipe)
     object->closed = true;
     // Wake a transfer or an accept blocked in another thread; the descriptors close with the
     // last user. Data already sent stays readable for the peer.
-    if (const int conn = object->connFd; conn >= 0)
+    if (const int conn = object->connFd; conn != UniqueFd::kNone)
         shutdown(conn, SHUT_RDWR);
-    if (const int listener = object->listenFd; listener >= 0)
+    if (const int listener = object->listenFd; listener != UniqueFd::kNone)
         shutdown(listener, SHUT_RDWR);
+    // The files go now; the lock goes with the descriptor, which a new server of the name never
+    // meets, since it makes a new lock file.
     std::lock_guard<std::mutex> lock(object->mutex);
     if (object->server) {
         unlink(object->socketPath.c_str());
         unlink(object->lockPath.c_str());
-        flock range = wholeFile(F_UNLCK);
-        fcntl(object->lockFd, F_OFD_SETLK, &range);
     }
     return 0;
 }

@@ -3,6 +3,8 @@
 #include "zubase/platform/SysProcess.h"
 
 #include "zubase/platform/HandleTable.h"
+#include "zubase/platform/UniqueFd.h"
+#include "zubase/platform/WinCommandLine.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -35,11 +37,18 @@ namespace ZuPlatform {
 
 namespace {
 
+// The system's elevation tool, by absolute path, and its exit codes for a request it refused
+// or could not carry out.
+const char* const kElevationTool = "/usr/bin/pkexec";
+constexpr int kToolRefused = 126;
+constexpr int kToolFailed = 127;
+
 // A child this process created. Its reaper thread collects the exit status, so no child stays a
 // zombie whether or not anybody asks for its end.
 struct Child
 {
     explicit Child(pid_t inPid) : pid(inPid) {}
+    ~Child();
     const pid_t pid;
     std::mutex mutex;
     bool suspended = false;
@@ -76,17 +85,37 @@ Children& children()
     return *instance;
 }
 
+// The last holder of a child lets go of it: its entry goes, unless a new child has the pid.
+Child::~Child()
+{
+    Children& c = children();
+    std::lock_guard<std::mutex> lock(c.mutex);
+    const auto found = c.byPid.find(pid);
+    if (found != c.byPid.end() && found->second.expired())
+        c.byPid.erase(found);
+}
+
 std::shared_ptr<Child> findChild(pid_t inPid)
 {
     Children& c = children();
     std::lock_guard<std::mutex> lock(c.mutex);
     const auto found = c.byPid.find(inPid);
-    if (found == c.byPid.end())
-        return nullptr;
-    std::shared_ptr<Child> child = found->second.lock();
-    if (!child)
-        c.byPid.erase(found);
-    return child;
+    return found == c.byPid.end() ? nullptr : found->second.lock();
+}
+
+// Repeats a system call that a signal interrupted and gives its result.
+template <typename Call> auto uninterrupted(Call inCall)
+{
+    auto result = inCall();
+    while (result < 0 && errno == EINTR)
+        result = inCall();
+    return result;
+}
+
+// Collects the end of a child; true when it was ours to collect.
+bool collect(pid_t inPid, int& outStatus, int inOptions = 0)
+{
+    return uninterrupted([&] { return waitpid(inPid, &outStatus, inOptions); }) == inPid;
 }
 
 // Waits for the end without collecting it first, so that the pid cannot be reused while
@@ -94,25 +123,12 @@ std::shared_ptr<Child> findChild(pid_t inPid)
 void reap(std::shared_ptr<Child> inChild)
 {
     siginfo_t info;
-    for (;;) {
-        std::memset(&info, 0, sizeof info);
-        if (waitid(P_PID, inChild->pid, &info, WEXITED | WNOWAIT) == 0)
-            break;
-        if (errno != EINTR) {
-            std::lock_guard<std::mutex> lock(inChild->mutex);
-            inChild->ended = true;
-            inChild->lost = true;
-            return;
-        }
-    }
+    const bool seen =
+        uninterrupted([&] { return waitid(P_PID, inChild->pid, &info, WEXITED | WNOWAIT); }) == 0;
     std::lock_guard<std::mutex> lock(inChild->mutex);
     int status = 0;
-    pid_t got;
-    do {
-        got = waitpid(inChild->pid, &status, 0);
-    } while (got < 0 && errno == EINTR);
+    inChild->lost = !seen || !collect(inChild->pid, status);
     inChild->ended = true;
-    inChild->lost = got != inChild->pid;
     inChild->status = status;
 }
 
@@ -174,18 +190,35 @@ bool statFields(pid_t inPid, std::vector<std::string>& outFields, std::string* o
     return !outFields.empty();
 }
 
-std::string findInPath(const std::string& inProgram)
+// The file the caller named, taken from the current folder when the path is relative: never
+// looked up in PATH, where another program of that name may be.
+int absoluteProgramPath(const std::string& inProgram, std::string& outPath)
 {
-    if (inProgram.find('/') != std::string::npos)
-        return inProgram;
-    const char* path = std::getenv("PATH");
-    std::istringstream dirs(path ? path : "/usr/local/bin:/usr/bin:/bin");
-    for (std::string dir; std::getline(dirs, dir, ':');) {
-        const std::string candidate = (dir.empty() ? std::string(".") : dir) + "/" + inProgram;
-        if (access(candidate.c_str(), X_OK) == 0)
-            return candidate;
-    }
-    return std::string();
+    outPath = inProgram;
+    if (inProgram.empty() || inProgram[0] == '/')
+        return 0;
+    char cwd[4096];
+    if (!getcwd(cwd, sizeof cwd))
+        return errno;
+    outPath = std::string(cwd) + "/" + inProgram;
+    return 0;
+}
+
+// Whether the process is ending or has ended: set as the first step of an exit, before its
+// descriptors close.
+bool isEnding(pid_t inPid)
+{
+    constexpr unsigned long kExitingFlag = 0x4; // PF_EXITING
+    std::vector<std::string> fields;
+    if (!statFields(inPid, fields) || fields[0] == "Z" || fields[0] == "X")
+        return true;
+    return fields.size() > 6 && (std::strtoul(fields[6].c_str(), nullptr, 10) & kExitingFlag);
+}
+
+std::string& elevationTool()
+{
+    static std::string* const sTool = new std::string(kElevationTool);
+    return *sTool;
 }
 
 std::vector<char*> pointers(std::vector<std::string>& inTexts)
@@ -210,20 +243,27 @@ void resetSignals()
     sigprocmask(SIG_SETMASK, &none, nullptr);
 }
 
-void closeDescriptorsFrom(int inFirst, int inKeep)
+// Closes every descriptor from 3 on except the (at most two) given ones.
+void closeOtherDescriptors(int inKeep1, int inKeep2 = UniqueFd::kNone)
 {
+    int keep[2] = {std::min(inKeep1, inKeep2), std::max(inKeep1, inKeep2)};
+    int first = 3;
 #ifdef SYS_close_range
-    if (inKeep >= inFirst) {
-        if ((inKeep == inFirst || syscall(SYS_close_range, inFirst, inKeep - 1, 0) == 0) &&
-            syscall(SYS_close_range, inKeep + 1, ~0u, 0) == 0)
-            return;
-    } else if (syscall(SYS_close_range, inFirst, ~0u, 0) == 0) {
-        return;
+    bool closed = true;
+    for (int kept : keep) {
+        if (kept < first)
+            continue;
+        if (kept > first && syscall(SYS_close_range, first, kept - 1, 0) != 0)
+            closed = false;
+        first = kept + 1;
     }
+    if (closed && syscall(SYS_close_range, first, ~0u, 0) == 0)
+        return;
+    first = 3;
 #endif
     const long limit = std::min(sysconf(_SC_OPEN_MAX), 65536L);
-    for (int fd = inFirst; fd < limit; ++fd) {
-        if (fd != inKeep)
+    for (int fd = first; fd < limit; ++fd) {
+        if (fd != keep[0] && fd != keep[1])
             close(fd);
     }
 }
@@ -238,83 +278,11 @@ void writeErrorAndExit(int inPipe, int inError)
 int readError(int inPipe)
 {
     int error = 0;
-    ssize_t got;
-    do {
-        got = read(inPipe, &error, sizeof error);
-    } while (got < 0 && errno == EINTR);
+    const ssize_t got = uninterrupted([&] { return read(inPipe, &error, sizeof error); });
     return got == static_cast<ssize_t>(sizeof error) ? error : 0;
 }
 
 } // namespace
-
-std::vector<std::string> splitCommandLine(const std::string& inCommandLine)
-{
-    std::vector<std::string> args;
-    const char* p = inCommandLine.c_str();
-    const auto blank = [](char c) {
-        return c == ' ' || c == '\t';
-    };
-
-    // The program name: quotes toggle, backslashes are plain characters.
-    std::string program;
-    bool inQuotes = false;
-    while (*p && (inQuotes || !blank(*p))) {
-        if (*p == '"')
-            inQuotes = !inQuotes;
-        else
-            program += *p;
-        ++p;
-    }
-    if (program.empty() && p == inCommandLine.c_str())
-        return args;
-    args.push_back(program);
-
-    for (;;) {
-        while (blank(*p))
-            ++p;
-        if (!*p)
-            break;
-        std::string arg;
-        inQuotes = false;
-        for (;;) {
-            bool copy = true;
-            std::size_t backslashes = 0;
-            while (*p == '\\') {
-                ++p;
-                ++backslashes;
-            }
-            if (*p == '"') {
-                if (backslashes % 2 == 0) {
-                    if (inQuotes && p[1] == '"')
-                        ++p; // "" inside quotes is one literal quote
-                    else {
-                        copy = false;
-                        inQuotes = !inQuotes;
-                    }
-                }
-                backslashes /= 2;
-            }
-            arg.append(backslashes, '\\');
-            if (!*p || (!inQuotes && blank(*p)))
-                break;
-            if (copy)
-                arg += *p;
-            ++p;
-        }
-        args.push_back(arg);
-    }
-    return args;
-}
-
-std::vector<std::string> environmentEntries(const char* inBlock)
-{
-    std::vector<std::string> entries;
-    if (!inBlock)
-        return entries;
-    for (const char* p = inBlock; *p; p += std::strlen(p) + 1)
-        entries.emplace_back(p);
-    return entries;
-}
 
 int createProcessSuspended(const std::string& inCommandLine, const char* inEnvironmentBlock,
                            const std::string& inWorkingDirectory, ProcessCreation& outCreation)
@@ -322,15 +290,9 @@ int createProcessSuspended(const std::string& inCommandLine, const char* inEnvir
     std::vector<std::string> args = splitCommandLine(inCommandLine);
     if (args.empty() || args[0].empty())
         return ENOENT;
-    std::string program = findInPath(args[0]);
-    if (program.empty())
-        return ENOENT;
-    if (program[0] != '/') {
-        char cwd[4096];
-        if (!getcwd(cwd, sizeof cwd))
-            return errno;
-        program = std::string(cwd) + "/" + program;
-    }
+    std::string program;
+    if (const int error = absoluteProgramPath(args[0], program))
+        return error;
     struct stat info;
     if (stat(program.c_str(), &info) != 0)
         return errno;
@@ -348,60 +310,46 @@ int createProcessSuspended(const std::string& inCommandLine, const char* inEnvir
     std::vector<char*> envp = pointers(envTexts);
     const char* dir = inWorkingDirectory.empty() ? nullptr : inWorkingDirectory.c_str();
 
-    const int devNull = open("/dev/null", O_RDWR | O_CLOEXEC);
-    if (devNull < 0)
+    const UniqueFd devNull(open("/dev/null", O_RDWR | O_CLOEXEC));
+    if (!devNull.isOpen())
         return errno;
     int errorPipe[2];
-    if (pipe2(errorPipe, O_CLOEXEC) != 0) {
-        const int error = errno;
-        close(devNull);
-        return error;
-    }
+    if (pipe2(errorPipe, O_CLOEXEC) != 0)
+        return errno;
+    const UniqueFd errorReader(errorPipe[0]);
+    UniqueFd errorWriter(errorPipe[1]);
 
     const pid_t pid = fork();
-    if (pid < 0) {
-        const int error = errno;
-        close(devNull);
-        close(errorPipe[0]);
-        close(errorPipe[1]);
-        return error;
-    }
+    if (pid < 0)
+        return errno;
     if (pid == 0) {
         resetSignals();
         setsid(); // no terminal of ours: a detached process
-        dup2(devNull, 0);
-        dup2(devNull, 1);
-        dup2(devNull, 2);
+        dup2(devNull.get(), 0);
+        dup2(devNull.get(), 1);
+        dup2(devNull.get(), 2);
         if (dir && chdir(dir) != 0)
-            writeErrorAndExit(errorPipe[1], errno);
-        closeDescriptorsFrom(3, errorPipe[1]);
+            writeErrorAndExit(errorWriter.get(), errno);
+        closeOtherDescriptors(errorWriter.get());
         // Suspended: nothing of the program runs before the parent continues us.
         kill(getpid(), SIGSTOP);
         execve(program.c_str(), argv.data(), inEnvironmentBlock ? envp.data() : environ);
-        writeErrorAndExit(errorPipe[1], errno);
+        writeErrorAndExit(errorWriter.get(), errno);
     }
 
-    close(devNull);
-    close(errorPipe[1]);
+    errorWriter.reset();
     int status = 0;
-    pid_t got;
-    do {
-        got = waitpid(pid, &status, WUNTRACED);
-    } while (got < 0 && errno == EINTR);
-    if (got != pid) {
+    if (!collect(pid, status, WUNTRACED)) {
         // Its stop cannot be seen (the host collects children itself): do not leave it.
         const int error = errno;
         kill(pid, SIGKILL);
-        close(errorPipe[0]);
         return error;
     }
     if (!WIFSTOPPED(status)) {
         // It ended before the stop; the pipe tells why.
-        const int error = readError(errorPipe[0]);
-        close(errorPipe[0]);
+        const int error = readError(errorReader.get());
         return error ? error : ECHILD;
     }
-    close(errorPipe[0]);
 
     std::shared_ptr<Child> child = adoptChild(pid, true);
     HandleEntry entry;
@@ -411,7 +359,6 @@ int createProcessSuspended(const std::string& inCommandLine, const char* inEnvir
     entry.thread = true;
     outCreation.thread = handles().add(entry);
     outCreation.processId = static_cast<unsigned>(pid);
-    outCreation.threadId = static_cast<unsigned>(pid);
     return 0;
 }
 
@@ -433,7 +380,7 @@ int resumeThread(Handle inThread, int& outPreviousCount)
 
 int openProcess(unsigned inProcessId, bool inFullAccess, Handle& outProcess)
 {
-    outProcess = 0;
+    outProcess = kNullHandle;
     const pid_t pid = static_cast<pid_t>(inProcessId);
     if (pid <= 0)
         return EINVAL;
@@ -449,10 +396,8 @@ int openProcess(unsigned inProcessId, bool inFullAccess, Handle& outProcess)
                 return errno == EPERM ? EACCES : errno;
         } else {
             // Reading the mappings needs the same right as reading the modules later.
-            const int fd = open(procPath(pid, "maps").c_str(), O_RDONLY | O_CLOEXEC);
-            if (fd < 0)
+            if (!UniqueFd(open(procPath(pid, "maps").c_str(), O_RDONLY | O_CLOEXEC)).isOpen())
                 return errno;
-            close(fd);
         }
     }
     outProcess = handles().add(entry);
@@ -467,7 +412,7 @@ int exitCodeProcess(Handle inProcess, int& outExitCode)
     if (entry.child) {
         std::lock_guard<std::mutex> lock(entry.child->mutex);
         if (!entry.child->ended) {
-            outExitCode = StillActive;
+            outExitCode = kStillActive;
             return 0;
         }
         if (entry.child->lost)
@@ -480,11 +425,27 @@ int exitCodeProcess(Handle inProcess, int& outExitCode)
     if (!statFields(entry.pid, fields))
         return ESRCH;
     if (fields[0] != "Z" && fields[0] != "X") {
-        outExitCode = StillActive;
+        outExitCode = kStillActive;
         return 0;
     }
     // Field 52 of the stat line: the status the parent will collect.
     outExitCode = fields.size() > 49 ? exitCodeOf(std::atoi(fields[49].c_str()), false, 0) : 0;
+    return 0;
+}
+
+int processEnded(Handle inProcess, bool& outEnded)
+{
+    outEnded = false;
+    HandleEntry entry;
+    if (!handles().find(inProcess, entry) || entry.thread)
+        return EBADF;
+    if (entry.child) {
+        std::lock_guard<std::mutex> lock(entry.child->mutex);
+        outEnded = entry.child->ended;
+        return 0;
+    }
+    std::vector<std::string> fields;
+    outEnded = !statFields(entry.pid, fields) || fields[0] == "Z" || fields[0] == "X";
     return 0;
 }
 
@@ -578,73 +539,80 @@ int processImageFileName(Handle inProcess, std::string& outPath)
     return 0;
 }
 
+std::size_t childrenTracked()
+{
+    Children& c = children();
+    std::lock_guard<std::mutex> lock(c.mutex);
+    return c.byPid.size();
+}
+
 unsigned currentProcessId()
 {
     return static_cast<unsigned>(getpid());
 }
 
+void setElevationTool(const std::string& inPath)
+{
+    elevationTool() = inPath.empty() ? kElevationTool : inPath;
+}
+
 int shellExecuteElevated(const std::string& inFile, const std::vector<std::string>& inArguments)
 {
-    const std::string tool = findInPath("pkexec");
-    if (tool.empty())
-        return ENOENT;
-    std::vector<std::string> args{tool, inFile};
+    const std::string tool = elevationTool();
+    if (access(tool.c_str(), X_OK) != 0)
+        return errno;
+    // The tool looks a relative program up in PATH: hand it the file the caller checked.
+    std::string program;
+    if (const int error = absoluteProgramPath(inFile, program))
+        return error;
+    std::vector<std::string> args{tool, program};
     args.insert(args.end(), inArguments.begin(), inArguments.end());
     std::vector<char*> argv = pointers(args);
 
-    std::string ownComm;
-    readFile("/proc/thread-self/comm", ownComm);
-    while (!ownComm.empty() && ownComm.back() == '\n')
-        ownComm.pop_back();
-
     int errorPipe[2];
+    int startPipe[2];
     if (pipe2(errorPipe, O_CLOEXEC) != 0)
         return errno;
+    const UniqueFd errorReader(errorPipe[0]);
+    UniqueFd errorWriter(errorPipe[1]);
+    if (pipe2(startPipe, O_CLOEXEC) != 0)
+        return errno;
+    const UniqueFd startReader(startPipe[0]);
+    UniqueFd startWriter(startPipe[1]);
+
     const pid_t pid = fork();
-    if (pid < 0) {
-        const int error = errno;
-        close(errorPipe[0]);
-        close(errorPipe[1]);
-        return error;
-    }
+    if (pid < 0)
+        return errno;
     if (pid == 0) {
         resetSignals();
-        closeDescriptorsFrom(3, errorPipe[1]);
+        closeOtherDescriptors(errorWriter.get(), startWriter.get());
+        // The start pipe goes through our exec into the tool, which marks every descriptor
+        // above 2 close-on-exec before it replaces itself with the program.
+        fcntl(startWriter.get(), F_SETFD, 0);
         execv(tool.c_str(), argv.data());
-        writeErrorAndExit(errorPipe[1], errno);
+        writeErrorAndExit(errorWriter.get(), errno);
     }
-    close(errorPipe[1]);
-    // The pipe closes when the tool has been loaded, or carries the error of the attempt.
-    const int error = readError(errorPipe[0]);
-    close(errorPipe[0]);
-    if (error) {
-        int status;
-        while (waitpid(pid, &status, 0) < 0 && errno == EINTR) {
-        }
+    errorWriter.reset();
+    startWriter.reset();
+    // The error pipe closes when the tool has been loaded, or carries the error of the attempt.
+    int status = 0;
+    if (const int error = readError(errorReader.get())) {
+        collect(pid, status);
         return error;
     }
-
-    std::shared_ptr<Child> child = adoptChild(pid, false);
-    // The tool asks the user, then replaces itself with the program; it ends with 126 or 127
-    // when the request was declined or not authorised. The program has started once the
-    // child's name is neither ours (it may not be updated yet) nor the tool's.
-    const std::string toolComm = tool.substr(tool.rfind('/') + 1).substr(0, 15);
-    std::vector<std::string> fields;
-    for (;;) {
-        {
-            std::lock_guard<std::mutex> lock(child->mutex);
-            if (child->ended) {
-                if (child->lost)
-                    return 0;
-                const int code = exitCodeOf(child->status, false, 0);
-                return code == 126 || code == 127 ? EACCES : 0;
-            }
-        }
-        std::string comm;
-        if (statFields(pid, fields, &comm) && comm != ownComm && comm != toolComm)
-            return 0;
-        std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    // The start pipe closes when the tool has started the program, or when it ends without:
+    // after a refusal, or a request the user declined (then it ends with 126 or 127).
+    char byte;
+    uninterrupted([&] { return read(startReader.get(), &byte, 1); });
+    if (!isEnding(pid)) {
+        adoptChild(pid, false); // the program runs; collected when it ends
+        return 0;
     }
+    if (!collect(pid, status))
+        return 0; // collected by the host: nothing tells that it failed
+    // Any other code is the program's own, of a program that ended at once.
+    const int code = exitCodeOf(status, false, 0);
+    return code == kToolRefused || code == kToolFailed ? EACCES : 0;
 }
 
 void elevationInfo(bool& outElevated, bool& outAdmin)

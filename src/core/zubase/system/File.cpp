@@ -2,16 +2,18 @@
 
 #include "zubase/Impersonation.h"
 #include "zubase/ZuCheck_p.h"
-#include "zubase/platform/SysFiles.h"
 #include "zubase/platform/ReparseBuffer.h"
+#include "zubase/platform/SysFiles.h"
+#include "zubase/platform/SysTypes.h"
 
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
+#include <QRegularExpression>
 
 namespace {
 
-const char* const sCategory = "ZuBase";
+const char* const kCategory = "ZuBase";
 
 // Absolute, with native separators; empty stays empty.
 QString nativeAbsolutePath(const QString& inPath)
@@ -34,18 +36,97 @@ QString fromU16(const std::u16string& inText)
 
 void traceRemoval(const char* inFormat, const QString& inPath, bool inGone)
 {
-    getTheLogInstance().tracef(inGone ? RkLogInfo : RkLogWarning, sCategory, inFormat,
+    getTheLogInstance().tracef(inGone ? RkLogInfo : RkLogWarning, kCategory, inFormat,
                                Q2M(inPath).constData(), inGone ? "ok" : "fail");
 }
 
-void* const sCurrentProcessToken = reinterpret_cast<void*>(static_cast<intptr_t>(-1));
+// An opened folder of the removal walk, closed with the object.
+struct Folder
+{
+    ~Folder() { ZuPlatform::filesCloseFolder(handle); }
+    ZuPlatform::FolderHandle handle = ZuPlatform::kInvalidHandle;
+};
+
+// Name filters as QDir applies them when listing: wildcards, case-insensitive.
+QList<QRegularExpression> wildcards(const QStringList& inFilters)
+{
+    QList<QRegularExpression> patterns;
+    for (const QString& filter : inFilters)
+        patterns << QRegularExpression(QRegularExpression::wildcardToRegularExpression(filter),
+                                       QRegularExpression::CaseInsensitiveOption);
+    return patterns;
+}
+
+bool matchesAny(const QList<QRegularExpression>& inPatterns, const QString& inName)
+{
+    for (const QRegularExpression& pattern : inPatterns) {
+        if (pattern.match(inName).hasMatch())
+            return true;
+    }
+    return false;
+}
+
+struct RemovalFilters
+{
+    QList<QRegularExpression> names; // none: every file
+    QList<QRegularExpression> kept;
+    bool keeping; // a keep list was given: it keeps every folder too
+    bool recursive;
+};
+
+void removeEntries(ZuPlatform::FolderHandle inFolder, const QString& inPath,
+                   const RemovalFilters& inFilters);
+
+// A folder below the one being emptied, reached through its opened parent: the same steps as
+// the top one, with links removed themselves and never followed.
+void removeSubfolder(ZuPlatform::FolderHandle inParent, const std::string& inName,
+                     const QString& inPath, const RemovalFilters& inFilters)
+{
+    ZuPlatform::filesRemoveEntry(inParent, inName, true);
+    ZuPlatform::filesRemoveEntry(inParent, inName, false);
+    if (!ZuPlatform::filesEntryExists(inParent, inName))
+        return;
+    Folder folder;
+    if (ZuPlatform::filesOpenFolder(inParent, inName, folder.handle) == 0)
+        removeEntries(folder.handle, inPath, inFilters);
+    ZuPlatform::filesRemoveEntry(inParent, inName, true);
+    traceRemoval("QDir::rmdir() [%s] -> %s", inPath,
+                 !ZuPlatform::filesEntryExists(inParent, inName));
+}
+
+// Lists the folder as QDir does with files, all folders, hidden and system entries, unsorted,
+// and removes the listed entries from the last to the first.
+void removeEntries(ZuPlatform::FolderHandle inFolder, const QString& inPath,
+                   const RemovalFilters& inFilters)
+{
+    std::vector<ZuPlatform::FolderEntry> entries;
+    if (ZuPlatform::filesListFolder(inFolder, entries) != 0)
+        return;
+    for (auto entry = entries.rbegin(); entry != entries.rend(); ++entry) {
+        const QString name = QFile::decodeName(QByteArray::fromStdString(entry->name));
+        const bool folder = entry->kind != ZuPlatform::EntryKind::File;
+        if (!folder && !inFilters.names.isEmpty() && !matchesAny(inFilters.names, name))
+            continue; // not listed
+        if (inFilters.keeping && (folder || matchesAny(inFilters.kept, name)))
+            continue;
+        const QString path = inPath + QLatin1Char('/') + name;
+        if (folder) {
+            if (inFilters.recursive)
+                removeSubfolder(inFolder, entry->name, path, inFilters);
+            continue;
+        }
+        ZuPlatform::filesRemoveEntry(inFolder, entry->name, false);
+        traceRemoval("QFile::remove() [%s] -> %s", path,
+                     !ZuPlatform::filesEntryExists(inFolder, entry->name));
+    }
+}
 
 // Opens a directory's reparse point, with the restore privilege raised first as writing or
 // reading one may need it.
 int openMountPoint(const std::string& inPath, ZuPlatform::ReparseHandle& outHandle)
 {
-    ZuBase::win32TokenAdjustPrivilege(sCurrentProcessToken, const_cast<char*>("SeRestorePrivilege"),
-                                      true);
+    ZuBase::win32TokenAdjustPrivilege(ZuPlatform::kCurrentProcessToken,
+                                      const_cast<char*>("SeRestorePrivilege"), true);
     return ZuPlatform::filesOpenReparsePoint(inPath, outHandle);
 }
 
@@ -99,10 +180,7 @@ RkResult writeAll(QIODevice& inDevice, void* inData, qint64 inSize)
     qint64 remaining = inSize;
     while (remaining > 0) {
         const qint64 numBytesDone = inDevice.write(data, remaining);
-        if (Tz::fail(RK_CHECK(numBytesDone > 0, "numBytesDone > 0", "Internal Error"))) {
-            res.makeBad(1);
-            return res;
-        }
+        ZU_CHECK_RETURN(res, RK_CHECK(numBytesDone > 0, "numBytesDone > 0", "Internal Error"));
         data += numBytesDone;
         remaining -= numBytesDone;
     }
@@ -115,10 +193,9 @@ RkResult removeFile(const QString& inFilePath)
     if (!QFile::exists(inFilePath))
         return res;
     QFile::remove(inFilePath);
-    traceRemoval("QFile::remove() [%s] -> %s", inFilePath, !QFile::exists(inFilePath));
-    if (Tz::fail(
-            RK_CHECK(!QFile::exists(inFilePath), "!QFile::exists(inFilePath)", "Internal Error")))
-        res.makeBad(1);
+    const bool gone = !QFile::exists(inFilePath);
+    traceRemoval("QFile::remove() [%s] -> %s", inFilePath, gone);
+    ZU_CHECK_RETURN(res, RK_CHECK(gone, "!QFile::exists(inFilePath)", "Internal Error"));
     return res;
 }
 
@@ -133,32 +210,14 @@ RkResult removeDir(const QString& inDirPath, bool inRecursive, const QStringList
     if (!self.exists() && !self.isSymLink())
         return res;
 
-    QFileInfoList entries;
-    QFileInfoList kept;
-    if (!self.isSymLink()) {
-        const QDir dir(inDirPath);
-        const QDir::Filters filter =
-            QDir::Files | QDir::AllDirs | QDir::Hidden | QDir::System | QDir::NoDotAndDotDot;
-        entries = dir.entryInfoList(inNameFilters, filter, QDir::Unsorted);
-        if (!inKeepFilters.isEmpty())
-            kept = dir.entryInfoList(inKeepFilters, filter, QDir::Unsorted);
+    // A link is not listed at all: opening it as a folder fails.
+    Folder folder;
+    if (ZuPlatform::filesOpenFolder(ZuPlatform::kInvalidHandle, Q2M(inDirPath).toStdString(),
+                                    folder.handle) == 0) {
+        const RemovalFilters filters{wildcards(inNameFilters), wildcards(inKeepFilters),
+                                     !inKeepFilters.isEmpty(), inRecursive};
+        removeEntries(folder.handle, QDir(inDirPath).absolutePath(), filters);
     }
-    for (int i = entries.size() - 1; i >= 0; --i) {
-        const QFileInfo& entry = entries.at(i);
-        if (kept.contains(entry))
-            continue;
-        // A link to a directory counts as a directory: removeDir() drops the link itself.
-        if (entry.isDir()) {
-            if (inRecursive)
-                removeDir(entry.absoluteFilePath(), inRecursive, inNameFilters, inKeepFilters);
-            continue;
-        }
-        const QString path = entry.absoluteFilePath();
-        QFile::remove(path);
-        traceRemoval("QFile::remove() [%s] -> %s", path,
-                     !QFileInfo(path).exists() && !QFileInfo(path).isSymLink());
-    }
-
     QDir().rmdir(inDirPath);
     traceRemoval("QDir::rmdir() [%s] -> %s", inDirPath, !QFileInfo::exists(inDirPath));
     return res;
@@ -177,14 +236,10 @@ RkResult junctionCreate(const QString& inJunctionPath, const QString& inTargetPa
     ZuPlatform::ReparseHandle hDirMountPoint;
 
     const int createError = ZuPlatform::filesCreateDirectory(path);
-    const bool bret = createError == 0;
-    if (!bret && createError != EEXIST) {
-        if (Tz::failWin(RK_CHECK(bret, "bret", "::CreateDirectoryW"), createError)) {
-            res.makeBad(1);
-            return res;
-        }
-    }
-    const bool createdHere = bret;
+    // A folder already there is used as it is; any other failure is recorded as "bret".
+    const bool createdHere = createError == 0;
+    if (createError != EEXIST)
+        ZU_CHECK_WIN_RETURN(res, RK_CHECK(createdHere, "bret", "::CreateDirectoryW"), createError);
 
     const int openError = openMountPoint(path, hDirMountPoint);
     if (Tz::failWin(
@@ -220,12 +275,9 @@ RkResult junctionInfo(const QString& inPath, bool& outIsJunction, QString& outTa
     const std::string path = Q2M(nativeAbsolutePath(inPath)).toStdString();
     ZuPlatform::ReparseHandle hDirMountPoint;
     const int openError = openMountPoint(path, hDirMountPoint);
-    if (Tz::failWin(
-            RK_CHECK(openError == 0, "hDirMountPoint!=((HANDLE)(LONG_PTR)-1)", "::CreateFileW"),
-            openError)) {
-        res.makeBad(1);
-        return res;
-    }
+    ZU_CHECK_WIN_RETURN(
+        res, RK_CHECK(openError == 0, "hDirMountPoint!=((HANDLE)(LONG_PTR)-1)", "::CreateFileW"),
+        openError);
     std::vector<std::uint8_t> buffer;
     const int getError = ZuPlatform::filesGetReparsePoint(hDirMountPoint, buffer);
     if (getError != ZuPlatform::kFilesNotAReparsePoint) {
@@ -250,9 +302,7 @@ bool pathsPointToTheSameFile(const QString& inPath1, const QString& inPath2)
     // The files themselves, not only their folders: two files side by side are not the same.
     const QString canonical1 = QFileInfo(inPath1).canonicalFilePath();
     const QString canonical2 = QFileInfo(inPath2).canonicalFilePath();
-    if (canonical1.isEmpty() || canonical2.isEmpty())
-        return false;
-    return canonical1 == canonical2;
+    return !canonical1.isEmpty() && canonical1 == canonical2; // a missing file is no file
 }
 
 } // namespace ZuBase::File

@@ -29,7 +29,9 @@ ZUBASE_EXPORT RkResult removeFile(const QString& inFilePath);
 // Removes the entries matching inNameFilters (all when empty), except those matching
 // inKeepFilters (a non-empty keep list keeps every subdirectory), descending into
 // subdirectories when inRecursive, then the directory itself if it became empty. Symbolic
-// links are removed, never followed. Never bad: what could not go shows as "fail" lines.
+// links are removed, never followed: the walk goes through opened folders, so a folder swapped
+// for a link meanwhile cannot lead it elsewhere. Never bad: what could not go shows as "fail"
+// lines.
 ZUBASE_EXPORT RkResult removeDir(const QString& inDirPath, bool inRecursive,
                                  const QStringList& inNameFilters,
                                  const QStringList& inKeepFilters);

@@ -1,8 +1,8 @@
 #include "zubase/Hardware.h"
 
-#include "zubase/system/Hardware_p.h"
 #include "zubase/ZuCheck_p.h"
 #include "zubase/platform/SysDrives.h"
+#include "zubase/system/Hardware_p.h"
 
 #include <QCoreApplication>
 #include <QFileInfo>
@@ -12,6 +12,10 @@
 #include <vector>
 
 namespace {
+
+constexpr int kStartTimeout = 5000;
+constexpr int kFinishTimeout = 10000;
+constexpr int kKillTimeout = 1000;
 
 // The text after the first ':' and the blank that follows it.
 QByteArray lineValue(const QByteArray& inLine)
@@ -95,14 +99,15 @@ void getHardwareType(QString& outProductName, QString& outSerialNumber, QString&
     // Program and arguments apart: the application directory may contain blanks.
     QProcess process;
     process.start(tool, QStringList() << QStringLiteral("-q"), QIODevice::ReadWrite);
-    if (!process.waitForStarted(5000))
+    if (!process.waitForStarted(kStartTimeout))
         return;
     // A tool that has not finished in time still gives what it has printed so far.
-    process.waitForFinished(10000);
+    process.waitForFinished(kFinishTimeout);
     const QByteArray output = process.readAllStandardOutput();
+    // Ended here, so that the QProcess destructor has no running process to warn about.
     if (process.state() != QProcess::NotRunning) {
         process.kill();
-        process.waitForFinished(1000);
+        process.waitForFinished(kKillTimeout);
     }
     parseDmiDecodeOutput(output, outProductName, outSerialNumber, outBios);
 }
@@ -115,12 +120,10 @@ RkResult getDiskFreeSpaceMB(const QString& inPath, unsigned int& outFreeMB, floa
     std::uint64_t freeBytes = 0;
     std::uint64_t totalBytes = 0;
     const int error = ZuPlatform::drivesFreeSpace(Q2M(inPath).toStdString(), freeBytes, totalBytes);
-    const bool ret = error == 0;
-    if (Tz::failWin(RK_CHECK(ret, "ret", QStringLiteral("::GetDiskFreeSpaceEx() [%1]").arg(inPath)),
-                    error)) {
-        res.makeBad(1);
-        return res;
-    }
+    const bool measured = error == 0; // recorded as "ret"
+    ZU_CHECK_WIN_RETURN(
+        res, RK_CHECK(measured, "ret", QStringLiteral("::GetDiskFreeSpaceEx() [%1]").arg(inPath)),
+        error);
     diskSpaceFromBytes(freeBytes, totalBytes, outFreeMB, outUsedPercent);
     return res;
 }

@@ -1,8 +1,9 @@
 #include "zubase/Impersonation.h"
 
-#include "zubase/system/Impersonation_p.h"
 #include "zubase/ZuCheck_p.h"
 #include "zubase/platform/SysAccounts.h"
+#include "zubase/platform/SysTypes.h"
+#include "zubase/system/Impersonation_p.h"
 
 #include <QByteArray>
 #include <QHostInfo>
@@ -14,35 +15,28 @@
 
 namespace {
 
-void* const sInvalidHandle = reinterpret_cast<void*>(static_cast<intptr_t>(-1));
-
 QString& pamServiceSetting()
 {
     static QString sService;
     return sService;
 }
 
-// Overwrites a secret before its memory is given back.
-void wipe(QByteArray& ioBytes)
+// Overwrites a secret before its memory is given back, on every way out of its scope.
+template <typename Text> class WipedOnExit
 {
-    if (!ioBytes.isEmpty())
-        ::explicit_bzero(ioBytes.data(), static_cast<std::size_t>(ioBytes.size()));
-    ioBytes.clear();
-}
+public:
+    explicit WipedOnExit(Text& ioText) : mText(ioText) {}
+    ~WipedOnExit()
+    {
+        ::explicit_bzero(static_cast<void*>(mText.data()), sizeof(*mText.data()) * mText.size());
+        mText.clear();
+    }
+    WipedOnExit(const WipedOnExit&) = delete;
+    WipedOnExit& operator=(const WipedOnExit&) = delete;
 
-void wipe(QString& ioText)
-{
-    if (!ioText.isEmpty())
-        ioText.fill(QChar(0));
-    ioText.clear();
-}
-
-void wipe(std::string& ioText)
-{
-    if (!ioText.empty())
-        ::explicit_bzero(&ioText[0], ioText.size());
-    ioText.clear();
-}
+private:
+    Text& mText;
+};
 
 ZuPlatform::AccountToken* accountToken(void* inToken)
 {
@@ -96,7 +90,7 @@ static RkResult win32TokenGetInformation(void* const inToken, ZuPlatform::TokenI
 {
     RkResult res;
     outData.clear();
-    std::size_t dwSize = 0;
+    std::size_t dwSize = 0; // the size the data needs; the name is part of the record
     int error =
         ZuPlatform::accountsGetTokenInformation(accountToken(inToken), inClass, nullptr, 0, dwSize);
     if (error != 0 && error != ERANGE) {
@@ -186,7 +180,7 @@ QString groupFlagsText(std::uint32_t inAttributes)
         std::uint32_t mask;
         const char* text;
     };
-    static const Flag sFlags[] = {
+    static const Flag kFlags[] = {
         {0x1, " SE_GROUP_MANDATORY"},
         {0x2, " SE_GROUP_ENABLED_BY_DEFAULT"},
         {0x4, " SE_GROUP_ENABLED"},
@@ -198,7 +192,7 @@ QString groupFlagsText(std::uint32_t inAttributes)
         {0x20000000, " SE_GROUP_RESOURCE"},
     };
     QString text;
-    for (const Flag& flag : sFlags) {
+    for (const Flag& flag : kFlags) {
         if (inAttributes & flag.mask)
             text += QLatin1String(flag.text);
     }
@@ -260,13 +254,11 @@ bool Win32Impersonation::login()
         return false;
     QString user;
     QString password;
+    const WipedOnExit<QString> wipedPassword(password);
     getImpersonationUser(user, password);
-    if (user.isEmpty() || password.isEmpty()) {
-        wipe(password);
+    if (user.isEmpty() || password.isEmpty())
         return true; // no impersonation wanted
-    }
     sAccessToken = win32Login(user, password);
-    wipe(password);
     return sAccessToken != nullptr;
 }
 
@@ -274,7 +266,7 @@ RkResult Win32Impersonation::impersonate(void* inToken)
 {
     RkResult res;
     int error = 0;
-    if (inToken == sInvalidHandle) {
+    if (inToken == ZuPlatform::kCurrentProcessToken) {
         // The process's own token: the thread takes the identity it has anyway.
         ZuPlatform::AccountToken* own = nullptr;
         error = ZuPlatform::accountsOpenProcessToken(own);
@@ -300,12 +292,12 @@ void* Win32Impersonation::win32Login(QString& inUser, QString& inPassword)
     // the local 8-bit encoding, as the account database stores it here: Latin-1 would turn
     // every character beyond it into '?' and let such passwords collide.
     QByteArray passwordBytes = inPassword.toLocal8Bit();
+    const WipedOnExit<QByteArray> wipedBytes(passwordBytes);
     std::string password(passwordBytes.constData(), static_cast<std::size_t>(passwordBytes.size()));
-    wipe(passwordBytes);
+    const WipedOnExit<std::string> wipedPassword(password);
     ZuPlatform::AccountToken* token = nullptr;
     const int error =
         ZuPlatform::accountsLogon(Q2M(pamServiceName()).toStdString(), pamUser, password, token);
-    wipe(password);
     Tz::logWinFunc(token ? 1 : 0, 1, "::LogonUser", Q2M(inUser).constData(), true, error);
     return token;
 }
@@ -343,11 +335,11 @@ RkResult win32TokenAdjustPrivilege(void* const inToken, char* const inPrivilegeN
     RkResult res;
     ZuPlatform::AccountToken* token = accountToken(inToken);
     bool opened = false;
-    if (inToken == sInvalidHandle) {
+    if (inToken == ZuPlatform::kCurrentProcessToken) {
         token = nullptr;
         const int error = ZuPlatform::accountsOpenProcessToken(token);
         if (Tz::logWinFunc(error == 0 ? 1 : 0, 1, "::OpenProcessToken", nullptr, false, error) ||
-            static_cast<void*>(token) == sInvalidHandle || !token) {
+            static_cast<void*>(token) == ZuPlatform::kCurrentProcessToken || !token) {
             res.makeBad(1);
             return res;
         }
@@ -378,7 +370,7 @@ void win32TokenLog(QString inTitle, void* const inToken)
     log.printf("<token> [%s]", title.constData());
     void* token = inToken;
     bool opened = false;
-    if (inToken == sInvalidHandle) {
+    if (inToken == ZuPlatform::kCurrentProcessToken) {
         ZuPlatform::AccountToken* processToken = nullptr;
         const int error = ZuPlatform::accountsOpenProcessToken(processToken);
         if (Tz::logWinFunc(error == 0 ? 1 : 0, 1, "::OpenProcessToken", nullptr, false, error)) {

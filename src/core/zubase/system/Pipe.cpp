@@ -10,10 +10,10 @@ namespace ZuBase {
 
 namespace {
 
-const int sAcceptTimeout = 1000;
-const int sConnectTimeout = 5000;
-const std::chrono::milliseconds sServePace(1000);
-const unsigned long sStopCheckInterval = 20;
+constexpr int kAcceptTimeout = 1000;
+constexpr int kConnectTimeout = 5000;
+constexpr std::chrono::milliseconds kServePace(1000);
+constexpr unsigned long kStopCheckInterval = 20;
 
 std::string systemName(const QString& inName)
 {
@@ -27,13 +27,13 @@ struct Pipe::SharedHandle
 {
     ~SharedHandle()
     {
-        const std::intptr_t handle = value.exchange(InvalidHandle);
-        if (handle != InvalidHandle) {
+        const std::intptr_t handle = value.exchange(ZuPlatform::kInvalidHandle);
+        if (handle != ZuPlatform::kInvalidHandle) {
             ZuPlatform::flushPipe(handle);
             ZuPlatform::closePipe(handle);
         }
     }
-    std::atomic<std::intptr_t> value{InvalidHandle};
+    std::atomic<std::intptr_t> value{ZuPlatform::kInvalidHandle};
 };
 
 Pipe::Pipe(bool inIsServer) : mServer(inIsServer), mHandle(std::make_shared<SharedHandle>()) {}
@@ -81,18 +81,18 @@ QString Pipe::name() const
 
 bool Pipe::isCreated() const
 {
-    return handle() != InvalidHandle;
+    return handle() != ZuPlatform::kInvalidHandle;
 }
 
 RkResult Pipe::createOnServer()
 {
     RkResult res;
     close(); // a handle of an earlier creation would otherwise leak and block the name
-    ZuPlatform::PipeHandle created = ZuPlatform::InvalidPipe;
+    ZuPlatform::PipeHandle created = ZuPlatform::kInvalidHandle;
     const int error = ZuPlatform::createNamedPipe(systemName(mName), created);
     setHandle(created);
-    if (Tz::failWin(RK_CHECK_NE(handle(), InvalidHandle, "::CreateNamedPipe"), error))
-        res.makeBad(1);
+    ZU_CHECK_WIN_RETURN(res, RK_CHECK_NE(handle(), ZuPlatform::kInvalidHandle, "::CreateNamedPipe"),
+                        error);
     return res;
 }
 
@@ -101,7 +101,7 @@ RkResult Pipe::acceptOnServer()
     RkResult res;
     getTheLogInstance().printf(
         "%s", Q2M(QStringLiteral("::ConnectNamedPipe() [%1]").arg(mName)).constData());
-    const bool connected = ZuPlatform::connectNamedPipe(handle(), sAcceptTimeout) == 0;
+    const bool connected = ZuPlatform::connectNamedPipe(handle(), kAcceptTimeout) == 0;
     if (connected)
         getTheLogInstance().printf("pipeConnected");
     else
@@ -115,14 +115,15 @@ RkResult Pipe::connectOnClient()
     RkResult res;
     close(); // as for createOnServer: an earlier handle would leak
     const std::string name = systemName(mName);
-    ZuPlatform::waitNamedPipe(name, sConnectTimeout); // only gives the server time to appear
-    ZuPlatform::PipeHandle opened = ZuPlatform::InvalidPipe;
+    ZuPlatform::waitNamedPipe(name, kConnectTimeout); // only gives the server time to appear
+    ZuPlatform::PipeHandle opened = ZuPlatform::kInvalidHandle;
     const int error = ZuPlatform::openNamedPipeForReading(name, opened);
     setHandle(opened);
-    if (handle() == InvalidHandle) {
+    if (handle() == ZuPlatform::kInvalidHandle) {
         if (error == ENOENT)
             res.makeBad(1);
-        else if (Tz::failWin(RK_CHECK_NE(handle(), InvalidHandle, "::CreateFile"), error))
+        else if (Tz::failWin(RK_CHECK_NE(handle(), ZuPlatform::kInvalidHandle, "::CreateFile"),
+                             error))
             res.makeBad(1);
     }
     mConnected = res.isOk();
@@ -137,11 +138,8 @@ RkResult Pipe::read(void* outBuffer, unsigned int inSize)
     while (remaining > 0) {
         unsigned int got = 0;
         const int error = ZuPlatform::readPipe(handle(), buffer, remaining, got);
-        const bool b = error == 0;
-        if (Tz::failWin(RK_CHECK(b, "b", "::ReadFile"), error)) {
-            res.makeBad(1);
-            return res;
-        }
+        const bool transferred = error == 0; // recorded as "b"
+        ZU_CHECK_WIN_RETURN(res, RK_CHECK(transferred, "b", "::ReadFile"), error);
         buffer += got;
         remaining -= got;
     }
@@ -156,11 +154,8 @@ RkResult Pipe::write(const void* inBuffer, unsigned int inSize)
     do {
         unsigned int sent = 0;
         const int error = ZuPlatform::writePipe(handle(), buffer + written, inSize - written, sent);
-        const bool b = error == 0;
-        if (Tz::failWin(RK_CHECK(b, "b", "::WriteFile"), error)) {
-            res.makeBad(1);
-            return res;
-        }
+        const bool transferred = error == 0; // recorded as "b"
+        ZU_CHECK_WIN_RETURN(res, RK_CHECK(transferred, "b", "::WriteFile"), error);
         written += sent;
     } while (written < inSize);
     return res;
@@ -168,8 +163,8 @@ RkResult Pipe::write(const void* inBuffer, unsigned int inSize)
 
 void Pipe::close()
 {
-    const std::intptr_t closing = mHandle->value.exchange(InvalidHandle);
-    if (closing != InvalidHandle) {
+    const std::intptr_t closing = mHandle->value.exchange(ZuPlatform::kInvalidHandle);
+    if (closing != ZuPlatform::kInvalidHandle) {
         ZuPlatform::flushPipe(closing);
         ZuPlatform::closePipe(closing);
     }
@@ -210,8 +205,8 @@ void PipeServer::run()
         const auto passStart = std::chrono::steady_clock::now();
         mPipe->acceptOnServer();
         // While a client stays connected (or has gone) a pass returns at once: pace it.
-        while (!mStop && std::chrono::steady_clock::now() - passStart < sServePace)
-            RkThread::msleep(sStopCheckInterval);
+        while (!mStop && std::chrono::steady_clock::now() - passStart < kServePace)
+            RkThread::msleep(kStopCheckInterval);
     }
 }
 

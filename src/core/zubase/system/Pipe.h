@@ -20,8 +20,6 @@ namespace ZuBase {
 class ZUBASE_EXPORT Pipe
 {
 public:
-    static constexpr std::intptr_t InvalidHandle = -1;
-
     explicit Pipe(bool inIsServer);
     // Copies share the one system handle; it is closed by close() on any copy or when the last
     // copy is destroyed, never twice.

@@ -1,8 +1,9 @@
 #include "zubase/Process.h"
 
-#include "zubase/system/Process_p.h"
 #include "zubase/ZuCheck_p.h"
 #include "zubase/platform/SysProcess.h"
+#include "zubase/platform/WinCommandLine.h"
+#include "zubase/system/Process_p.h"
 
 #include "rklib/RkDbC.h"
 #include "rklib/RkThread.h"
@@ -58,11 +59,10 @@ QByteArray environmentBlock(const QStringList& inEnvironment)
 
 namespace {
 
-constexpr std::uint32_t sStartupInformationSize = 68;
-const char* const sDesktop = "winsta0\\default";
-const int sPollInterval = 100;
-const unsigned long sWaitInterval = 10;
-const std::intptr_t sFakeElevatedProcessId = 4711;
+constexpr int kPollInterval = 100;
+constexpr unsigned long kWaitInterval = 10;
+// The process id an elevated start leaves: the system does not tell the real one.
+constexpr unsigned int kElevatedProcessId = 4711;
 
 struct ElevationCache
 {
@@ -94,11 +94,19 @@ struct ProcessHandle
 {
     ~ProcessHandle()
     {
-        if (value != 0)
+        if (value != ZuPlatform::kNullHandle)
             ZuPlatform::closeHandle(value);
     }
-    ZuPlatform::Handle value = 0;
+    ZuPlatform::Handle value = ZuPlatform::kNullHandle;
 };
+
+// The exit code kStillActive is also the code of a child terminated with it: only the
+// process's own state tells whether it still runs.
+bool hasEnded(ZuPlatform::Handle inProcess)
+{
+    bool ended = false;
+    return ZuPlatform::processEnded(inProcess, ended) == 0 && ended;
+}
 
 // A process that cannot be opened gives a bad result without a record.
 RkResult openResult(int inError)
@@ -121,8 +129,7 @@ RkResult Process::start(bool inElevate, bool inInheritEnvironment, bool)
 {
     RkResult res;
     mExitCode = -1;
-    mProcessInformation = ProcessInformation();
-    mStartupInformation = StartupInformation();
+    closeHandles(); // of an earlier start that was not detached; none is open from here on
     mTerminatedEmitted = false;
     mPlaceholderId = false;
 
@@ -145,15 +152,8 @@ RkResult Process::start(bool inElevate, bool inInheritEnvironment, bool)
     log.printf("  </Environment>");
     log.printf("</Process::start()>");
 
-    if (Tz::fail(RK_CHECK(QFile::exists(mExePath), "QFile::exists(mExePath)", "Internal Error"))) {
-        res.makeBad(1);
-        closeHandles();
-        return res;
-    }
-
-    mStartupInformation.size = sStartupInformationSize;
-    mStartupInformation.desktop = sDesktop;
-    mStartupInformation.flags = 0;
+    ZU_CHECK_RETURN(res,
+                    RK_CHECK(QFile::exists(mExePath), "QFile::exists(mExePath)", "Internal Error"));
 
     if (inElevate) {
         const std::vector<std::string> file = ZuPlatform::splitCommandLine(quotedExe.toStdString());
@@ -162,13 +162,10 @@ RkResult Process::start(bool inElevate, bool inInheritEnvironment, bool)
         parameters.erase(parameters.begin());
         const int error =
             ZuPlatform::shellExecuteElevated(file.empty() ? std::string() : file[0], parameters);
+        // Recorded as the instance check of ShellExecute.
         const bool launched = error == 0;
-        if (Tz::failWin(RK_CHECK(launched, "int(hinst)>32", "::ShellExecute"), error)) {
-            res.makeBad(1);
-            closeHandles();
-            return res;
-        }
-        mProcessId = sFakeElevatedProcessId;
+        ZU_CHECK_WIN_RETURN(res, RK_CHECK(launched, "int(hinst)>32", "::ShellExecute"), error);
+        mProcessId = kElevatedProcessId;
         mPlaceholderId = true;
         return res;
     }
@@ -177,16 +174,10 @@ RkResult Process::start(bool inElevate, bool inInheritEnvironment, bool)
     const int error = ZuPlatform::createProcessSuspended(
         commandLine.toStdString(), inInheritEnvironment ? nullptr : environment.constData(),
         Q2M(mWorkingDirectory).toStdString(), creation);
-    const bool b = error == 0;
-    if (Tz::failWin(RK_CHECK(b, "b", "::CreateProcess"), error)) {
-        res.makeBad(1);
-        closeHandles();
-        return res;
-    }
-    mProcessInformation.process = creation.process;
-    mProcessInformation.thread = creation.thread;
-    mProcessInformation.processId = creation.processId;
-    mProcessInformation.threadId = creation.threadId;
+    const bool created = error == 0; // recorded as "b"
+    ZU_CHECK_WIN_RETURN(res, RK_CHECK(created, "b", "::CreateProcess"), error);
+    mProcessHandle = creation.process;
+    mThreadHandle = creation.thread;
 
     log.printf("CreateProcess(): success pid[%d]", static_cast<int>(creation.processId));
     mProcessId = creation.processId;
@@ -197,14 +188,14 @@ RkResult Process::start(bool inElevate, bool inInheritEnvironment, bool)
 void Process::resume()
 {
     int previousCount = 0;
-    ZuPlatform::resumeThread(mProcessInformation.thread, previousCount);
+    ZuPlatform::resumeThread(mThreadHandle, previousCount);
 }
 
 int Process::wait()
 {
     resume();
     while (isRunning())
-        RkThread::msleep(sWaitInterval);
+        RkThread::msleep(kWaitInterval);
     return mExitCode;
 }
 
@@ -212,20 +203,19 @@ bool Process::isRunning()
 {
     if (mProcessId == 0)
         return false;
-    ZuPlatform::Handle process = 0;
-    if (openWatched(true, process) != 0)
+    ProcessHandle process;
+    if (openWatched(true, process.value) != 0)
         return false;
-    bool running = false;
     int code = 0;
-    const int error = ZuPlatform::exitCodeProcess(process, code);
-    if (error != 0)
+    const int error = ZuPlatform::exitCodeProcess(process.value, code);
+    if (error != 0) {
         Tz::failWin(RK_CHECK(false, "false", "::GetExitCodeProcess"), error);
-    else if (code == ZuPlatform::StillActive)
-        running = true;
-    else
-        mExitCode = code;
-    ZuPlatform::closeHandle(process);
-    return running;
+        return false;
+    }
+    if (code == ZuPlatform::kStillActive && !hasEnded(process.value))
+        return true;
+    mExitCode = code;
+    return false;
 }
 
 void Process::checkRunning()
@@ -241,7 +231,7 @@ void Process::checkRunning()
     if (mPollArmed)
         return;
     mPollArmed = true;
-    QTimer::singleShot(sPollInterval, this, [this] {
+    QTimer::singleShot(kPollInterval, this, [this] {
         mPollArmed = false;
         checkRunning();
     });
@@ -254,17 +244,14 @@ RkResult Process::terminate(int inExitCode)
         res.makeBad(1);
         return res;
     }
-    ZuPlatform::Handle hProcess = 0;
-    int error = openWatched(true, hProcess);
-    if (Tz::failWin(RK_CHECK(hProcess != 0, "hProcess!=0", "::OpenProcess"), error)) {
-        res.makeBad(1);
-        return res;
-    }
-    error = ZuPlatform::terminateProcess(hProcess, inExitCode);
-    const bool isOk = error == 0;
-    if (Tz::failWin(RK_CHECK(isOk, "isOk", "::TerminateProcess"), error))
-        res.makeBad(1);
-    ZuPlatform::closeHandle(hProcess);
+    ProcessHandle hProcess;
+    int error = openWatched(true, hProcess.value);
+    ZU_CHECK_WIN_RETURN(
+        res, RK_CHECK(hProcess.value != ZuPlatform::kNullHandle, "hProcess!=0", "::OpenProcess"),
+        error);
+    error = ZuPlatform::terminateProcess(hProcess.value, inExitCode);
+    const bool terminated = error == 0; // recorded as "isOk"
+    ZU_CHECK_WIN_RETURN(res, RK_CHECK(terminated, "isOk", "::TerminateProcess"), error);
     return res;
 }
 
@@ -273,7 +260,7 @@ int Process::openWatched(bool inFullAccess, std::intptr_t& outHandle) const
     // The id left by an elevated start names no process here (on Windows it cannot be a
     // process id at all); a process that happens to have it must not be touched.
     if (mPlaceholderId) {
-        outHandle = 0;
+        outHandle = ZuPlatform::kNullHandle;
         return ESRCH;
     }
     return ZuPlatform::openProcess(mProcessId, inFullAccess, outHandle);
@@ -287,13 +274,10 @@ void Process::detach()
 void Process::closeHandles()
 {
     // Reset afterwards, so that a second detach() closes nothing.
-    if (mProcessInformation.process != InvalidHandle) {
-        ZuPlatform::closeHandle(mProcessInformation.process);
-        mProcessInformation.process = 0;
-    }
-    if (mProcessInformation.thread != InvalidHandle) {
-        ZuPlatform::closeHandle(mProcessInformation.thread);
-        mProcessInformation.thread = 0;
+    for (std::intptr_t* handle : {&mProcessHandle, &mThreadHandle}) {
+        if (*handle != ZuPlatform::kNullHandle)
+            ZuPlatform::closeHandle(*handle);
+        *handle = ZuPlatform::kNullHandle;
     }
 }
 
@@ -307,10 +291,8 @@ RkResult Process::imageFilePath(QString& outPath)
     std::string path;
     const int error = ZuPlatform::processImageFileName(process.value, path);
     const std::size_t len = error == 0 ? path.size() : 0;
-    if (Tz::failWin(RK_CHECK(len > 0, "len>0", "Internal Error"), error))
-        res.makeBad(1);
-    else
-        outPath = fileName(path);
+    ZU_CHECK_WIN_RETURN(res, RK_CHECK(len > 0, "len>0", "Internal Error"), error);
+    outPath = fileName(path);
     return res;
 }
 
@@ -323,11 +305,8 @@ RkResult Process::modules(QStringList& outPaths)
         return res;
     std::vector<std::string> paths;
     const int error = ZuPlatform::processModules(process.value, paths);
-    const bool bret = error == 0;
-    if (Tz::failWin(RK_CHECK(bret != 0, "bret!=0", "Internal Error"), error)) {
-        res.makeBad(1);
-        return res;
-    }
+    const bool listed = error == 0; // recorded as "bret!=0"
+    ZU_CHECK_WIN_RETURN(res, RK_CHECK(listed, "bret!=0", "Internal Error"), error);
     for (const std::string& path : paths) {
         const std::size_t len = path.size();
         if (Tz::fail(RK_CHECK(len > 0, "len>0", "Internal Error")))
@@ -343,11 +322,8 @@ RkResult Process::processes(QList<QSharedPointer<Process>>& outList)
     outList.clear();
     std::vector<unsigned> ids;
     const int error = ZuPlatform::enumProcesses(ids);
-    const bool ret = error == 0;
-    if (Tz::failWin(RK_CHECK(ret != 0, "ret!=0", "EnumProcesses"), error)) {
-        res.makeBad(1);
-        return res;
-    }
+    const bool listed = error == 0; // recorded as "ret!=0"
+    ZU_CHECK_WIN_RETURN(res, RK_CHECK(listed, "ret!=0", "EnumProcesses"), error);
     for (auto id = ids.rbegin(); id != ids.rend(); ++id) {
         QSharedPointer<Process> process(new Process);
         process->mProcessId = *id;

@@ -30,24 +30,6 @@ class ZUBASE_EXPORT Process : public QObject
     Q_OBJECT
 
 public:
-    // Handles and ids of the created child; all zero before a start.
-    struct ProcessInformation
-    {
-        std::intptr_t process = 0;
-        std::intptr_t thread = 0;
-        std::uint32_t processId = 0;
-        std::uint32_t threadId = 0;
-    };
-    // The start parameters handed to the system along with the command line.
-    struct StartupInformation
-    {
-        std::uint32_t size = 0;
-        const char* desktop = nullptr;
-        std::uint32_t flags = 0;
-    };
-    // A handle value that stands for no handle.
-    static constexpr std::intptr_t InvalidHandle = -1;
-
     Process();
     ~Process() override;
 
@@ -113,8 +95,9 @@ private:
     void closeHandles();
     int openWatched(bool inFullAccess, std::intptr_t& outHandle) const;
 
-    ProcessInformation mProcessInformation;
-    StartupInformation mStartupInformation;
+    // The created child's process and main-thread handles; zero before a start.
+    std::intptr_t mProcessHandle = 0;
+    std::intptr_t mThreadHandle = 0;
     unsigned int mProcessId = 0;
     int mExitCode = -1;
     bool mPollArmed = false;
