@@ -1,13 +1,10 @@
-// Text and conversion helpers: date and time texts, environment expansion, fillers, viewport
-// sizing, case-insensitive strings, scoped connections and the Qt message handler.
+// Text and conversion helpers: date and time texts, environment expansion, fillers,
+// case-insensitive strings and the Qt message handler.
 #include "zubase/ZuConvert.h"
-#include "zubase/ZuScopedConnection.h"
 #include "zubase/ZuStringCaseInsensitive.h"
 
 #include "rklib/RkLogFile.h"
 
-#include <QScrollArea>
-#include <QVBoxLayout>
 #include <QtTest>
 
 #include <vector>
@@ -15,12 +12,6 @@
 Q_DECLARE_METATYPE(QtMsgType)
 
 namespace {
-
-class FixedHintWidget : public QWidget
-{
-public:
-    QSize sizeHint() const override { return QSize(420, 260); }
-};
 
 std::vector<std::string> sCallbackTexts;
 
@@ -38,9 +29,7 @@ private slots:
     void expandEnvironmentVariables();
     void replaceFillers();
     void randomText();
-    void resizeWidgetToViewport();
     void caseInsensitive();
-    void scopedConnection();
     void messageHandler_data();
     void messageHandler();
 };
@@ -178,30 +167,6 @@ void TestConvert::randomText()
     }
 }
 
-void TestConvert::resizeWidgetToViewport()
-{
-    QWidget window;
-    auto* area = new QScrollArea;
-    (new QVBoxLayout(&window))->addWidget(area);
-    auto* content = new FixedHintWidget;
-    area->setWidget(content);
-    window.resize(200, 120);
-    window.show();
-    QVERIFY(QTest::qWaitForWindowExposed(&window));
-    QVERIFY(area->maximumViewportSize() != content->sizeHint());
-
-    Zu::resizeWidgetToViewport(&window, area);
-    QTRY_COMPARE(area->maximumViewportSize(), content->sizeHint());
-
-    // Null pointers and an area without content leave the widget alone.
-    const QSize before = window.size();
-    Zu::resizeWidgetToViewport(nullptr, area);
-    Zu::resizeWidgetToViewport(&window, nullptr);
-    QScrollArea empty;
-    Zu::resizeWidgetToViewport(&window, &empty);
-    QCOMPARE(window.size(), before);
-}
-
 void TestConvert::caseInsensitive()
 {
     QVERIFY(ZuStringCaseInsensitive("Abc") == QStringLiteral("aBC"));
@@ -213,37 +178,6 @@ void TestConvert::caseInsensitive()
     QCOMPARE(text = "\xE9t\xE9", QString::fromUtf8("été"));
     QCOMPARE(text = QStringLiteral("ABC"), QStringLiteral("ABC"));
     QVERIFY(text == QStringLiteral("abc"));
-}
-
-void TestConvert::scopedConnection()
-{
-    QObject sender;
-    int calls = 0;
-    auto connect = [&] {
-        return ZuScopedConnection(
-            QObject::connect(&sender, &QObject::objectNameChanged, [&calls] { ++calls; }));
-    };
-    auto fire = [&] { // the number of connected slots
-        const int before = calls;
-        sender.setObjectName(sender.objectName() + QLatin1Char('x'));
-        return calls - before;
-    };
-    connect(); // the only share goes away at once
-    QCOMPARE(fire(), 0);
-
-    ZuScopedConnection first = connect();
-    {
-        ZuScopedConnection second = first;
-        QCOMPARE(fire(), 1);
-    }
-    QCOMPARE(fire(), 1); // one copy gone, the other holds it
-    ZuScopedConnection third = first;
-    first.disconnect();
-    QCOMPARE(fire(), 1); // disconnect() drops a share only
-    third.disconnect();
-    QCOMPARE(fire(), 0);
-    third.disconnect(); // nothing left to drop
-    QCOMPARE(fire(), 0);
 }
 
 void TestConvert::messageHandler_data()
@@ -299,5 +233,5 @@ void TestConvert::messageHandler()
     QCOMPARE(sCallbackTexts, expectedCallback);
 }
 
-QTEST_MAIN(TestConvert)
+QTEST_GUILESS_MAIN(TestConvert)
 #include "tst_convert.moc"
