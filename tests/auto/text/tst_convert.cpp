@@ -113,7 +113,7 @@ void TestConvert::expandEnvironmentVariables_data()
     row("self reference", "%ZU_SELF%", "%ZU_SELF%");
     row("mutual reference", "%ZU_P%", "%ZU_P%");
     row("growing reference", "%ZU_GROW%",
-        "%ZU_GROW%" + QString(Zu::maxEnvironmentReplacements, QLatin1Char('x')));
+        "%ZU_GROW%" + QString(Zu::kMaxEnvironmentReplacements, QLatin1Char('x')));
     row("many references", QStringLiteral("%ZU_A%;").repeated(100),
         QStringLiteral("alpha;").repeated(100));
 }
@@ -153,7 +153,7 @@ void TestConvert::randomText()
 
         // At most 256 replacements of values no longer than "%ZU_GROW%x".
         const QString expanded = Zu::expandEnvironmentVariables(text);
-        QVERIFY(expanded.size() <= text.size() + 10 * Zu::maxEnvironmentReplacements);
+        QVERIFY(expanded.size() <= text.size() + 10 * Zu::kMaxEnvironmentReplacements);
         if (!text.contains(QLatin1Char('%')) && !text.contains(QLatin1String("${")))
             QCOMPARE(expanded, text);
 
