@@ -33,8 +33,12 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* inData, std::size_t in
 {
     const QString text = QString::fromUtf8(reinterpret_cast<const char*>(inData), int(inSize));
 
+    // Qt's number sections also take signs ("1230+5" is 12:30:05), so the read-back holds for
+    // digits and colons.
+    static const QRegularExpression digitsAndColons(QStringLiteral("^[0-9:]*$"));
     const QTime time = Zu::timeFromString(text);
-    check(!time.isValid() || time.toString(QStringLiteral("hh:mm:ss")) == text ||
+    check(!time.isValid() || !digitsAndColons.match(text).hasMatch() ||
+          time.toString(QStringLiteral("hh:mm:ss")) == text ||
           time.toString(QStringLiteral("hhmmss")) == text);
     const QDate date = Zu::dateFromString(text);
     if (date.isValid() && date.year() >= 1000 && date.year() <= 9999) {
