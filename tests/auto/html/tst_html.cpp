@@ -112,6 +112,13 @@ private Q_SLOTS:
             QCOMPARE(constTable[row][column].text(), QStringLiteral("changed"));
         }
     }
+
+    // Values beyond the enumerators, below or above, have empty texts.
+    void unknownEnumerators()
+    {
+        QVERIFY(ZuHtmlTable::attributeName(ZuHtmlTable::CellAttribute(-1)).isEmpty());
+        QVERIFY(ZuHtmlTable::attributeName(ZuHtmlTable::TableAttribute(5)).isEmpty());
+    }
 };
 
 QTEST_GUILESS_MAIN(TestHtml)

@@ -72,6 +72,7 @@ private Q_SLOTS:
                                   << QByteArray::fromHex(inHex);
         };
         row("plain", 2, 0, "hi", "03001d8555");
+        row("nothing", 2, 0, QByteArray(), "030076");
         row("checksum", 2, 1, kText, "0302eeb4e70cdacd5b9428bd");
         row("hash", 2, 2, kText, "0304eee818c178c2f34b077b444004e0c8f313de974b9b08509f003315dc");
         row("checksum, whole key rounds", 2, 1, "The quick brown fox jumps over the lazy dog",
