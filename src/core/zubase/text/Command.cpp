@@ -56,7 +56,7 @@ QString normalised(const QString& inItem)
     return item;
 }
 
-const char* const sGeneralUsage =
+const char* const kGeneralUsage =
     "\n"
     "Usage: %1 { '--'Command {Attribute} }\n"
     "\n"
@@ -154,14 +154,12 @@ RkResult Command::create(RkHandle<Command>& outCommand, const QString& inCommand
     RkResult res;
     outCommand.clear();
     const Factory factory = factoryOf(inCommandName);
-    if (Tz::fail(RK_CHECK(factory != nullptr, "sListOfFactory.contains(Q2M(inCommandName))",
-                          "Internal Error"))) {
-        res.makeBad(1);
-        return res;
-    }
+    // The recorded condition text is part of the record: it names the registry lookup.
+    ZU_CHECK_RETURN(res, RK_CHECK(factory != nullptr, "sListOfFactory.contains(Q2M(inCommandName))",
+                                  "Internal Error"));
     outCommand = factory();
-    if (Tz::fail(RK_CHECK(outCommand.isNotNull(), "outCommand.isNotNull()", "Internal Error")))
-        res.makeBad(1);
+    ZU_CHECK_RETURN(res,
+                    RK_CHECK(outCommand.isNotNull(), "outCommand.isNotNull()", "Internal Error"));
     return res;
 }
 
@@ -174,41 +172,32 @@ RkResult Command::parseCommands(const QStringList& inArgs, RkDArray<RkHandle<Com
     for (const QString& arg : inArgs)
         items.append(normalised(arg));
 
+    // Collected apart, so that a failure anywhere hands back no commands at all.
+    RkDArray<RkHandle<Command>> parsed;
     const QString dashes = QStringLiteral("--");
     int next = 0;
-    while (next < items.size() && !res.isBad()) {
+    while (next < items.size()) {
         const QString& item = items.at(next++);
         const int posOfDashes = item.indexOf(dashes);
-        if (Tz::fail(RK_CHECK_EQ(posOfDashes, 0, tr("parse error near '%1'").arg(item)))) {
-            res.makeBad(1);
-            break;
-        }
+        ZU_CHECK_RETURN(res, RK_CHECK_EQ(posOfDashes, 0, tr("parse error near '%1'").arg(item)));
         const QString name = item.mid(2);
         RkHandle<Command> command;
         create(command, name); // reports an unknown name itself
-        if (Tz::fail(RK_CHECK(command.isNotNull(), "command.isNotNull()",
-                              tr("unknown command '%1'").arg(name)))) {
-            res.makeBad(1);
-            break;
-        }
-        outCommands.append(command);
+        ZU_CHECK_RETURN(res, RK_CHECK(command.isNotNull(), "command.isNotNull()",
+                                      tr("unknown command '%1'").arg(name)));
+        parsed.append(command);
 
-        while (next < items.size() && !items.at(next).startsWith(dashes) && !res.isBad()) {
+        while (next < items.size() && !items.at(next).startsWith(dashes)) {
             const QString& attribute = items.at(next++);
             const int posOfEqualSign = attribute.indexOf(QLatin1Char('='));
-            if (Tz::fail(RK_CHECK(posOfEqualSign > 0, "posOfEqualSign>0",
-                                  tr("parse error near '%1'").arg(attribute)))) {
-                res.makeBad(1);
-                break;
-            }
+            ZU_CHECK_RETURN(res, RK_CHECK(posOfEqualSign > 0, "posOfEqualSign>0",
+                                          tr("parse error near '%1'").arg(attribute)));
             command->attributeAdd(attribute.left(posOfEqualSign),
                                   attribute.mid(posOfEqualSign + 1));
         }
-        if (!res.isBad())
-            command->executeEarly();
+        command->executeEarly();
     }
-    if (res.isBad())
-        outCommands.clear();
+    outCommands = parsed;
     return res;
 }
 
@@ -239,7 +228,7 @@ QString Command::usage(const QString& inCommandName, bool inPrint)
             names.append(name);
             blocks += QStringLiteral("\n   --%1\n\n       %2\n").arg(name, description);
         }
-        text = QString::fromLatin1(sGeneralUsage)
+        text = QString::fromLatin1(kGeneralUsage)
                    .arg(QStringLiteral("program.exe"), names.join(QStringLiteral(" | ")), blocks);
     }
     if (inPrint) {
@@ -269,19 +258,21 @@ RkResult Command::attribute1(RkHandle<Attribute>& outAttribute, QString inName,
 {
     RkResult res;
     outAttribute.clear();
-    RkDArray<RkHandle<Attribute>> arr;
-    attributes(arr, inName);
+    RkDArray<RkHandle<Attribute>> matches;
+    attributes(matches, inName);
+    // The first match is handed out even when the count is wrong.
+    if (matches.size() > 0)
+        outAttribute = matches[0];
     if (inExactlyOnce) {
-        if (Tz::fail(RK_CHECK_EQ(arr.size(), 1,
-                                 tr("The attribute '%1' must occur exactly once.").arg(inName))))
-            res.makeBad(1);
-    } else if (Tz::fail(
-                   RK_CHECK(arr.size() < 2, "arr.size()<2",
-                            tr("The attribute '%1' must not occur more than once.").arg(inName)))) {
-        res.makeBad(1);
+        ZU_CHECK_RETURN(res,
+                        RK_CHECK_EQ(matches.size(), 1,
+                                    tr("The attribute '%1' must occur exactly once.").arg(inName)));
+    } else {
+        // The recorded condition text is part of the record and stays "arr.size()<2".
+        ZU_CHECK_RETURN(
+            res, RK_CHECK(matches.size() < 2, "arr.size()<2",
+                          tr("The attribute '%1' must not occur more than once.").arg(inName)));
     }
-    if (arr.size() > 0)
-        outAttribute = arr[0];
     return res;
 }
 

@@ -62,7 +62,7 @@ QTime timeFromString(const QString& inText)
 QString expandEnvironmentVariables(const QString& inText)
 {
     QString text = inText;
-    for (int replacements = 0; replacements < maxEnvironmentReplacements; ++replacements) {
+    for (int replacements = 0; replacements < kMaxEnvironmentReplacements; ++replacements) {
         int start = text.indexOf(QLatin1Char('%'));
         int nameStart = 0;
         int end = -1;

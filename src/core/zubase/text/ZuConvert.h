@@ -37,11 +37,11 @@ ZUBASE_EXPORT QTime timeFromString(const QString& inText);
 // variable's value (empty when unset) and rescans the result from its start, so values that
 // contain references are expanded in turn. An unterminated reference ends the expansion: the
 // text is returned as it stands.
-// Bound: at most maxEnvironmentReplacements replacements are made per call; values that refer
+// Bound: at most kMaxEnvironmentReplacements replacements are made per call; values that refer
 // to themselves (A=%A%) or to each other would otherwise be expanded for ever. When the bound is
 // reached the text is returned as it stands, with the remaining references unexpanded.
 ZUBASE_EXPORT QString expandEnvironmentVariables(const QString& inText);
-constexpr int maxEnvironmentReplacements = 256;
+constexpr int kMaxEnvironmentReplacements = 256;
 
 // Turns every character of inFillers into inFill, drops leading and trailing inFill characters
 // and reduces every inner run of them to one.
