@@ -115,6 +115,10 @@ private slots:
     void overwrite_data();
     void overwrite();
     void messageBoxSplashAndCursor();
+    void parentDeletedDuringExec_data();
+    void parentDeletedDuringExec();
+    void boxOnSplash_data();
+    void boxOnSplash();
 
 private:
     std::unique_ptr<QWidget> mMain;
@@ -485,6 +489,66 @@ void TestDialogs::messageBoxSplashAndCursor()
     QVERIFY(splashGone);
     QCOMPARE(cursor, int(Qt::ArrowCursor));
     QCOMPARE(QGuiApplication::overrideCursor()->shape(), Qt::WaitCursor);
+}
+
+void TestDialogs::parentDeletedDuringExec_data()
+{
+    QTest::addColumn<int>("kind");
+    QTest::newRow("exec") << 0;
+    QTest::newRow("getInt") << 1;
+    QTest::newRow("warning") << 2;
+    QTest::newRow("open file") << 3;
+}
+
+void TestDialogs::parentDeletedDuringExec()
+{
+    QFETCH(int, kind);
+    QWidget* window = new QWidget;
+    window->show();
+    whenModal([window](QWidget*) { delete window; });
+    bool ok = true;
+    switch (kind) {
+    case 0: {
+        auto* dialog = new ZuDialog(window);
+        QCOMPARE(dialog->exec(), 0);
+        break;
+    }
+    case 1:
+        QCOMPARE(ZuInputDialog::getInt(window, "t", "l", 4, 0, 9, 1, &ok), 4);
+        QVERIFY(!ok);
+        break;
+    case 2:
+        ZuMessageBox::warning(window, "t", "x");
+        break;
+    case 3:
+        QCOMPARE(ZuFileDialog::getOpenFileName(window, "t", mDir.path()), QString());
+        break;
+    }
+}
+
+void TestDialogs::boxOnSplash_data()
+{
+    QTest::addColumn<bool>("asDefault");
+    QTest::newRow("parent") << false;
+    QTest::newRow("default parent") << true;
+}
+
+void TestDialogs::boxOnSplash()
+{
+    QFETCH(bool, asDefault);
+    QPixmap pixmap(30, 20);
+    pixmap.fill(Qt::green);
+    QPointer<QSplashScreen> splash = new QSplashScreen(pixmap);
+    ZuApplication::instance()->setSplashScreen(splash);
+    if (asDefault)
+        ZuApplication::instance()->setDefaultParentProvider(new Provider(splash));
+    whenModal([](QWidget* inModal) {
+        qobject_cast<QMessageBox*>(inModal)->button(QMessageBox::Yes)->click();
+    });
+    QCOMPARE(ZuMessageBox::question(asDefault ? nullptr : splash.data(), "t", "x",
+                                    QMessageBox::Yes | QMessageBox::No, QMessageBox::Yes),
+             QMessageBox::Yes);
+    QVERIFY(splash.isNull());
 }
 
 int main(int argc, char** argv, char** envp)
