@@ -9,6 +9,7 @@
 #include <QEventLoop>
 #include <QPointer>
 #include <QPushButton>
+#include <QSplashScreen>
 #include <QTemporaryDir>
 #include <QThread>
 #include <QUrl>
@@ -130,6 +131,7 @@ private slots:
     void protocolHandler();
     void deferredDelete();
     void deferredDeleteReportCap();
+    void splashScreen();
 
 private:
     std::vector<std::unique_ptr<ZuApplication::HookNotify>> mHooks;
@@ -445,6 +447,26 @@ void TestApplication::deferredDeleteReportCap()
     QVERIFY(aliveInHandler);
     QTRY_VERIFY(guard.isNull());
     QCOMPARE(deferredDeleteLines(capture).size(), 5000 - 1);
+}
+
+void TestApplication::splashScreen()
+{
+    ZuApplication* app = ZuApplication::instance();
+    QPixmap pixmap(30, 20);
+    pixmap.fill(Qt::green);
+    QPointer<QSplashScreen> first = new QSplashScreen(pixmap);
+    app->setSplashScreen(first);
+    QVERIFY(first->isVisible());
+    QPointer<QSplashScreen> second = new QSplashScreen(pixmap);
+    app->setSplashScreen(second); // replaces and deletes the first
+    QVERIFY(first.isNull());
+    app->setSplashScreen(second); // handed in again: kept
+    QVERIFY(!second.isNull());
+    // The host deletes its splash itself; closing it later must not delete it again.
+    delete second;
+    app->setSplashScreen(nullptr);
+    app->setSplashScreen(new QSplashScreen(pixmap)); // and the next one is owned as before
+    app->setSplashScreen(nullptr);
 }
 
 int main(int argc, char** argv)

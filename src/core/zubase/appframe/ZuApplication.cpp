@@ -336,7 +336,10 @@ ZuApplication::ZuApplication(int& argc, char** argv, char** envp)
     QGuiApplication::setDesktopSettingsAware(false);
 }
 
-ZuApplication::~ZuApplication() = default;
+ZuApplication::~ZuApplication()
+{
+    delete mSplashScreen.data();
+}
 
 bool ZuApplication::isMainThread()
 {
@@ -424,9 +427,10 @@ void ZuApplication::setDefaultParentProvider(DefaultParentProvider* inProvider)
 
 void ZuApplication::setSplashScreen(QSplashScreen* inSplash)
 {
-    if (inSplash == mSplashScreen.get())
+    if (inSplash == mSplashScreen)
         return;
-    mSplashScreen.reset(inSplash);
+    delete mSplashScreen.data();
+    mSplashScreen = inSplash;
     if (inSplash) {
         inSplash->show();
         QCoreApplication::processEvents();
