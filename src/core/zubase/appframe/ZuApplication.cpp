@@ -5,6 +5,7 @@
 
 #include <QAbstractEventDispatcher>
 #include <QEvent>
+#include <QPointer>
 #include <QProcess>
 #include <QSplashScreen>
 #include <QThread>
@@ -101,7 +102,7 @@ Qt::HANDLE sFastPathThreadId = nullptr;
 // The main thread's id while hooks are installed (and the stack needs no capacity check).
 Qt::HANDLE sHookedPathThreadId = nullptr;
 int sDeferredDeleteReports = 0;
-const int sMaxDeferredDeleteReports = 5000;
+const int kMaxDeferredDeleteReports = 5000;
 
 inline Qt::HANDLE currentThreadHandle()
 {
@@ -141,8 +142,8 @@ inline bool isSpecialEventType(QEvent::Type inType)
 }
 
 // QObject keeps a "deleteLater() was called" flag and drops a further deferred delete while
-// the flag is set and other events are pending for the object. The postponed deletion is
-// swallowed here without deleting the object, so the flag has to go before re-posting, or the
+// the flag is set and other events are pending for the object. A postponed deletion is
+// swallowed without deleting the object, so the flag has to go before re-posting, or the
 // deletion would be lost.
 struct DeleteLaterFlag : QObject
 {
@@ -152,9 +153,66 @@ struct DeleteLaterFlag : QObject
     }
 };
 
+// Deletions that an object still handling an event obstructed. Re-posting one at once would
+// only have it delivered again in the same nested event loop, round after round; it waits
+// instead until the notify stack has dropped to the obstructing object's level (its handler
+// has returned), which the main event dispatcher's aboutToBlock() and awake() look for.
+struct PostponedDeletion
+{
+    QPointer<QObject> object;
+    int level;
+};
+std::vector<PostponedDeletion> sPostponed;
+QMetaObject::Connection sPostponedWatch[2];
+
+void retryPostponed()
+{
+    const int depth = sNotifyStack.size();
+    for (auto it = sPostponed.begin(); it != sPostponed.end();) {
+        QObject* object = it->object.data();
+        if (object && depth > it->level) {
+            ++it;
+            continue;
+        }
+        it = sPostponed.erase(it);
+        if (object) {
+            DeleteLaterFlag::clear(object);
+            object->deleteLater();
+        }
+    }
+    if (sPostponed.empty()) {
+        for (QMetaObject::Connection& connection : sPostponedWatch)
+            QObject::disconnect(connection);
+    }
+}
+
+void postpone(QObject* inObject, int inLevel)
+{
+    if (sPostponed.empty()) {
+        QAbstractEventDispatcher* dispatcher = QAbstractEventDispatcher::instance();
+        if (!dispatcher)
+            qFatal("ZuApplication: no event dispatcher to retry a postponed deletion");
+        sPostponedWatch[0] =
+            QObject::connect(dispatcher, &QAbstractEventDispatcher::aboutToBlock, &retryPostponed);
+        sPostponedWatch[1] =
+            QObject::connect(dispatcher, &QAbstractEventDispatcher::awake, &retryPostponed);
+    }
+    sPostponed.push_back({inObject, inLevel});
+}
+
+PostponedDeletion* findPostponed(QObject* inObject)
+{
+    for (PostponedDeletion& postponed : sPostponed) {
+        if (postponed.object == inObject)
+            return &postponed;
+    }
+    return nullptr;
+}
+
 // Whether deleting inReceiver now would destroy an object that is still handling an event
 // further down the notify stack. Walks the receiver's tree depth first, pre-order; each object
 // is looked up in a sorted copy of the stack, so the cost is linear in the size of the tree.
+// An obstructed deletion is postponed (above) and reported once.
 Q_NEVER_INLINE bool deferredDeleteMustWait(QObject* inReceiver, QEvent* inEvent)
 {
     const int depth = sNotifyStack.size();
@@ -174,16 +232,22 @@ Q_NEVER_INLINE bool deferredDeleteMustWait(QObject* inReceiver, QEvent* inEvent)
         return (it != active.end() && it->first == inObject) ? it->second : -1;
     };
 
+    // The first busy object in walk order is the one reported; the deletion waits for the
+    // lowest busy one of the whole tree.
     QObject* found = nullptr;
     int foundLevel = -1;
+    int waitLevel = depth;
     std::vector<QObject*> pending{inReceiver};
-    while (!pending.empty()) {
+    while (!pending.empty() && waitLevel > 0) {
         QObject* object = pending.back();
         pending.pop_back();
-        foundLevel = levelOf(object);
-        if (foundLevel >= 0) {
-            found = object;
-            break;
+        const int level = levelOf(object);
+        if (level >= 0) {
+            if (!found) {
+                found = object;
+                foundLevel = level;
+            }
+            waitLevel = std::min(waitLevel, level);
         }
         const QObjectList& children = object->children();
         for (auto it = children.crbegin(); it != children.crend(); ++it)
@@ -192,7 +256,13 @@ Q_NEVER_INLINE bool deferredDeleteMustWait(QObject* inReceiver, QEvent* inEvent)
     if (!found)
         return false;
 
-    if (sDeferredDeleteReports < sMaxDeferredDeleteReports) {
+    inEvent->accept();
+    // Asked again while it waits (the host called deleteLater() once more): no second report.
+    if (PostponedDeletion* waiting = findPostponed(inReceiver)) {
+        waiting->level = std::min(waiting->level, waitLevel);
+        return true;
+    }
+    if (sDeferredDeleteReports < kMaxDeferredDeleteReports) {
         // Pointers are written as 0x and hex digits; glibc's %p would add its own 0x.
         getTheLogInstance().tracef(
             RkLogFatal, "DeferredDelete",
@@ -203,9 +273,7 @@ Q_NEVER_INLINE bool deferredDeleteMustWait(QObject* inReceiver, QEvent* inEvent)
             foundLevel);
         ++sDeferredDeleteReports;
     }
-    inEvent->accept();
-    DeleteLaterFlag::clear(inReceiver);
-    inReceiver->deleteLater();
+    postpone(inReceiver, waitLevel);
     return true;
 }
 
