@@ -22,6 +22,7 @@ class TestAppFrameXvfb : public QObject
 private slots:
     void initTestCase();
     void screens();
+    void mouseButtons2_data();
     void mouseButtons2();
     void keptOnScreen();
     void messageBoxWidth_data();
@@ -55,10 +56,18 @@ void TestAppFrameXvfb::screens()
     QCOMPARE(QList<int>({x, y, w, h}), QList<int>({960, 600, 1920, 1200}));
 }
 
+void TestAppFrameXvfb::mouseButtons2_data()
+{
+    QTest::addColumn<int>("screen");
+    QTest::newRow("pointer on the application's screen") << 0;
+    QTest::newRow("pointer on another X screen") << 1;
+}
+
 void TestAppFrameXvfb::mouseButtons2()
 {
     // Press buttons through the XTEST extension and read them back from the server, not from
     // Qt's event queue (no event is processed in between).
+    QFETCH(int, screen);
     void* xtst = dlopen("libXtst.so.6", RTLD_NOW);
     if (!xtst)
         QSKIP("libXtst is not installed");
@@ -66,6 +75,7 @@ void TestAppFrameXvfb::mouseButtons2()
     auto fakeButton = reinterpret_cast<FakeButton>(dlsym(xtst, "XTestFakeButtonEvent"));
     QVERIFY(fakeButton);
     Display* display = QX11Info::display();
+    XWarpPointer(display, 0, RootWindow(display, screen), 0, 0, 0, 0, 100, 100);
     // Each step: button to press or release (negative), then the state expected.
     const QList<QPair<QList<int>, Qt::MouseButtons>> steps = {
         {{}, Qt::NoButton},

@@ -2,6 +2,9 @@
 
 #include "zubase/ZuCheck_p.h"
 #include "zubase/ZuWheelGrabber.h"
+#include "zubase/platform/SysInput.h"
+#include "zubase/platform/SysMemory.h"
+#include "zubase/platform/SysThread.h"
 
 #include <QAbstractEventDispatcher>
 #include <QEvent>
@@ -19,12 +22,6 @@
 #include <utility>
 #include <vector>
 
-#ifdef Q_OS_UNIX
-#include <pthread.h>
-#include <sys/mman.h>
-#include <unistd.h>
-#endif
-
 namespace {
 
 // Receivers of the notify() calls active on the main thread, outermost first.
@@ -34,7 +31,7 @@ namespace {
 // only backed by memory once touched, followed by an inaccessible guard page: it grows without
 // ever moving or being checked on the fast path. No thread's own stack can hold the frames of
 // a million nested dispatches, so the guard page is never reached before the thread's stack
-// would overflow. Elsewhere it is an ordinary array that doubles when full.
+// would overflow. Otherwise it is an ordinary array that doubles when full.
 struct NotifyStack
 {
     QObject** base = nullptr;
@@ -52,21 +49,13 @@ struct NotifyStack
     void grow();
 };
 
-#if defined(Q_OS_UNIX)
 const size_t kReserved = size_t(1) << 20;
-#endif
 
 void NotifyStack::grow()
 {
     const int used = size();
-#if defined(Q_OS_UNIX)
     if (!base) {
-        const size_t page = size_t(sysconf(_SC_PAGESIZE));
-        const size_t bytes = kReserved * sizeof(QObject*);
-        void* memory = mmap(nullptr, bytes + page, PROT_READ | PROT_WRITE,
-                            MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
-        if (memory != MAP_FAILED) {
-            mprotect(static_cast<char*>(memory) + bytes, page, PROT_NONE);
+        if (void* memory = ZuPlatform::memoryReserveWithGuard(kReserved * sizeof(QObject*))) {
             base = top = static_cast<QObject**>(memory);
             end = base + kReserved;
             reserved = true;
@@ -75,7 +64,6 @@ void NotifyStack::grow()
     }
     if (reserved)
         qFatal("ZuApplication: event dispatch nested more than %d levels", used);
-#endif
     const int capacity = base ? int(end - base) * 2 : 64;
     auto* data = static_cast<QObject**>(std::realloc(base, sizeof(QObject*) * size_t(capacity)));
     Q_CHECK_PTR(data);
@@ -104,19 +92,10 @@ Qt::HANDLE sHookedPathThreadId = nullptr;
 int sDeferredDeleteReports = 0;
 const int kMaxDeferredDeleteReports = 5000;
 
+// The same value as QThread::currentThreadId(), without a call: notify() asks for every event.
 inline Qt::HANDLE currentThreadHandle()
 {
-#if defined(Q_OS_LINUX) && defined(Q_PROCESSOR_X86_64) && defined(__GLIBC__)
-    // The thread's control block pointer, which is what pthread_self() and so
-    // QThread::currentThreadId() return, read without a call: notify() asks for every event.
-    Qt::HANDLE self;
-    __asm__("movq %%fs:0, %0" : "=r"(self));
-    return self;
-#elif defined(Q_OS_UNIX)
-    return reinterpret_cast<Qt::HANDLE>(pthread_self());
-#else
-    return QThread::currentThreadId();
-#endif
+    return ZuPlatform::threadCurrentId();
 }
 
 inline bool onMainThread()
@@ -571,29 +550,18 @@ void ZuApplication::handleFileOpenEvent(const QString& inFile, const QUrl& inUrl
     Q_EMIT protocolHandlerCalled();
 }
 
-// X11 last: its headers define macros (None, Bool, Status ...) that clash with Qt's.
-#include <X11/Xlib.h>
-
 Qt::MouseButtons ZuApplication::mouseButtons2()
 {
-    if (QX11Info::isPlatformX11()) {
-        if (Display* display = QX11Info::display()) {
-            Window root = 0;
-            Window child = 0;
-            int rootX = 0, rootY = 0, windowX = 0, windowY = 0;
-            unsigned int mask = 0;
-            if (XQueryPointer(display, DefaultRootWindow(display), &root, &child, &rootX, &rootY,
-                              &windowX, &windowY, &mask)) {
-                Qt::MouseButtons buttons;
-                if (mask & Button1Mask)
-                    buttons |= Qt::LeftButton;
-                if (mask & Button3Mask)
-                    buttons |= Qt::RightButton;
-                if (mask & Button2Mask)
-                    buttons |= Qt::MiddleButton;
-                return buttons;
-            }
-        }
+    unsigned buttons = 0;
+    if (QX11Info::isPlatformX11() && ZuPlatform::inputMouseButtons(QX11Info::display(), buttons)) {
+        Qt::MouseButtons result;
+        if (buttons & ZuPlatform::kMouseLeft)
+            result |= Qt::LeftButton;
+        if (buttons & ZuPlatform::kMouseRight)
+            result |= Qt::RightButton;
+        if (buttons & ZuPlatform::kMouseMiddle)
+            result |= Qt::MiddleButton;
+        return result;
     }
     // No window system to ask: the state Qt saw last is the closest we have.
     return QGuiApplication::mouseButtons();
