@@ -97,6 +97,21 @@ QPalette allRolesSet(QPalette inPalette)
 
 } // namespace
 
+QStyle* ZuStyleFactoryPrivate::widgetStyle(ZuStyleFactory& ioFactory, const QString& inClassName)
+{
+    // "Native" and the native class name are one class, as are spellings in other case.
+    QString key = inClassName.toLower();
+    if (key == QLatin1String("native"))
+        key = nativeStyleClass.toLower();
+    QPointer<QStyle>& style = widgetStyles[key];
+    if (!style) {
+        style = ioFactory.createStyleFromClass(inClassName);
+        if (style)
+            style->setParent(&ioFactory);
+    }
+    return style;
+}
+
 ThemeChangeObserver::~ThemeChangeObserver() = default;
 
 void ThemeChangeObserver::beforeNotify(QObject*, QEvent* inEvent)
@@ -272,11 +287,9 @@ bool ZuStyleFactory::setStyleForWidget(const QString& inSchemeName, QWidget* inW
     const auto scheme = d->schemes.constFind(inSchemeName);
     if (scheme == d->schemes.constEnd() || !inWidget)
         return false;
-    QStyle* style = createStyleFromClass(scheme->styleClass);
+    QStyle* style = d->widgetStyle(*this, scheme->styleClass);
     if (!style)
         return false;
-    // Widgets do not own their style; the factory keeps it for the rest of the process.
-    style->setParent(this);
     applyToTree(inWidget, style, allRolesSet(scheme->palette));
     return true;
 }
@@ -285,10 +298,9 @@ bool ZuStyleFactory::setNativeStyleForWidget(QWidget* inWidget)
 {
     if (!inWidget)
         return false;
-    QStyle* style = QStyleFactory::create(d->nativeStyleClass);
+    QStyle* style = d->widgetStyle(*this, d->nativeStyleClass);
     if (!style)
         return false;
-    style->setParent(this);
     applyToTree(inWidget, style, allRolesSet(d->nativePalette));
     return true;
 }
