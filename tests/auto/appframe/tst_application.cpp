@@ -15,17 +15,16 @@
 #include <atomic>
 #include <ctime>
 #include <functional>
-#include <memory>
 
 namespace {
 
 const QEvent::Type kTestEvent = QEvent::Type(QEvent::User + 1);
 
-// Records "<name>.before" / "<name>.after" and the receiver for test and wheel events.
+// Writes "<name>.before" / "<name>.after" for test and wheel events, with the receiver.
 class RecordingHook : public ZuApplication::HookNotify
 {
 public:
-    RecordingHook(const QString& inName, QStringList& ioCalls) : mName(inName), mCalls(ioCalls) {}
+    RecordingHook(QChar inName, QStringList& ioCalls) : mName(inName), mCalls(ioCalls) {}
     void beforeNotify(QObject* inReceiver, QEvent* inEvent) override
     {
         record(".before", inReceiver, inEvent);
@@ -38,19 +37,17 @@ public:
     }
     void record(const char* inPhase, QObject* inReceiver, QEvent* inEvent)
     {
-        if (inEvent->type() == kTestEvent || inEvent->type() == QEvent::Wheel) {
-            mCalls << mName + inPhase;
-            receivers << inReceiver;
-        }
+        if (inEvent->type() == kTestEvent || inEvent->type() == QEvent::Wheel)
+            mCalls << mName + inPhase +
+                          (inEvent->type() == kTestEvent ? "" : inReceiver->objectName());
     }
     QString mName;
     QStringList& mCalls;
-    QList<QObject*> receivers;
     bool removeSelf = false;
 };
 
-// Counts test and wheel events and runs onTestEvent inside each test event; with repost it
-// posts itself a new test event from each one.
+// Counts test and wheel events and runs onTest inside each test event; with repost it posts
+// itself the next test event from each one.
 class Receiver : public QObject
 {
 public:
@@ -62,8 +59,8 @@ public:
         if (inEvent->type() != kTestEvent)
             return QObject::event(inEvent);
         ++tests;
-        if (onTestEvent)
-            onTestEvent();
+        if (onTest)
+            onTest();
         if (repost)
             QCoreApplication::postEvent(this, new QEvent(kTestEvent));
         return true;
@@ -71,7 +68,7 @@ public:
     int wheels = 0;
     int tests = 0;
     bool repost = false;
-    std::function<void()> onTestEvent;
+    std::function<void()> onTest;
 };
 
 void sendTestEvent(QObject* inReceiver)
@@ -80,34 +77,21 @@ void sendTestEvent(QObject* inReceiver)
     QCoreApplication::sendEvent(inReceiver, &event);
 }
 
-void sendWheel(QObject* inReceiver)
-{
-    QWheelEvent wheel(QPointF(5, 5), QPointF(5, 5), QPoint(), QPoint(0, 120), Qt::NoButton,
-                      Qt::NoModifier, Qt::NoScrollPhase, false);
-    QCoreApplication::sendEvent(inReceiver, &wheel);
-}
-
-double cpuSeconds()
-{
-    timespec now = {};
-    clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &now);
-    return double(now.tv_sec) + double(now.tv_nsec) / 1e9;
-}
-
-QString hex(const void* inPointer)
-{
-    return QString::number(quintptr(inPointer), 16);
-}
-
 class FileOpenAccess : public ZuApplication
 {
 public:
     // Reaches the protected handler through a member pointer; no object of this class exists.
-    static void handle(ZuApplication* inApp, const QString& inFile, const QUrl& inUrl)
+    static void handle(const QString& inFile, const QUrl& inUrl)
     {
-        (inApp->*(&FileOpenAccess::handleFileOpenEvent))(inFile, inUrl);
+        (instance()->*(&FileOpenAccess::handleFileOpenEvent))(inFile, inUrl);
     }
 };
+
+// main() hands these to createInstance().
+char sEnv[][32] = {
+    "ZU_NAME=value=with=equals", "=C:=C:\\work",       "ZU_EMPTY=", "ZU_NOEQUALS", "ZU_TWICE=first",
+    "ZU_TWICE=second",           "ZU_LATIN1=\xe9t\xe9"};
+char* sEnvp[] = {sEnv[0], sEnv[1], sEnv[2], sEnv[3], sEnv[4], sEnv[5], sEnv[6], nullptr};
 
 } // namespace
 
@@ -117,9 +101,7 @@ class TestApplication : public QObject
 private Q_SLOTS:
     void initTestCase();
     void cleanupTestCase() { getTheLogInstance().removeSink(mReportSink); }
-    void cleanup();
-    void instanceAndMainThread();
-    void environment_data();
+    void mainThreadAndDepth();
     void environment();
     void hooks();
     void wheelGrab();
@@ -138,7 +120,6 @@ public Q_SLOTS:
 
 private:
     int mAboutShown = 0;
-    std::vector<std::unique_ptr<ZuApplication::HookNotify>> mHooks;
     // Every "DeferredDelete" report of the process: the cap counts them all.
     std::atomic<int> mReports{0};
     int mReportSink = -1;
@@ -152,35 +133,25 @@ void TestApplication::initTestCase()
     });
 }
 
-void TestApplication::cleanup()
-{
-    for (const auto& hook : mHooks)
-        ZuApplication::deInstallHookNotify(hook.get());
-    mHooks.clear();
-    ZuWheelGrabber::releaseWheel(nullptr);
-}
-
-void TestApplication::instanceAndMainThread()
+void TestApplication::mainThreadAndDepth()
 {
     int argc = 1;
-    char name[] = "again";
-    char* argv[] = {name, nullptr};
+    char* argv[] = {sEnv[3], nullptr};
     QCOMPARE(ZuApplication::createInstance(argc, argv, nullptr), ZuApplication::instance());
     QVERIFY(ZuApplication::isMainThread());
     bool workerIsMain = true;
     std::unique_ptr<QThread> worker(
-        QThread::create([&workerIsMain] { workerIsMain = ZuApplication::isMainThread(); }));
+        QThread::create([&] { workerIsMain = ZuApplication::isMainThread(); }));
     worker->start();
     QVERIFY(worker->wait(10000));
     QVERIFY(!workerIsMain);
-
     // Each handler sees its own level of the notify stack.
     Receiver outer, inner;
     QList<int> depths;
-    inner.onTestEvent = [&] {
+    inner.onTest = [&] {
         depths << ZuApplication::callDepth_of_notify();
     };
-    outer.onTestEvent = [&] {
+    outer.onTest = [&] {
         depths << ZuApplication::callDepth_of_notify();
         sendTestEvent(&inner);
     };
@@ -189,55 +160,32 @@ void TestApplication::instanceAndMainThread()
     QCOMPARE(ZuApplication::callDepth_of_notify(), 0);
 }
 
-// main() hands these entries to createInstance().
-char sEnv0[] = "ZU_NAME=value=with=equals";
-char sEnv1[] = "=C:=C:\\work";
-char sEnv2[] = "ZU_EMPTY=";
-char sEnv3[] = "ZU_NOEQUALS";
-char sEnv4[] = "ZU_TWICE=first";
-char sEnv5[] = "ZU_TWICE=second";
-char sEnv6[] = "ZU_LATIN1=\xe9t\xe9";
-char* sEnvp[] = {sEnv0, sEnv1, sEnv2, sEnv3, sEnv4, sEnv5, sEnv6, nullptr};
-
-void TestApplication::environment_data()
-{
-    QTest::addColumn<QString>("name");
-    QTest::addColumn<QString>("value"); // null: absent
-    QTest::newRow("value") << "ZU_NAME"
-                           << "value=with=equals";
-    QTest::newRow("empty value") << "ZU_EMPTY"
-                                 << "";
-    QTest::newRow("no equals sign") << "ZU_NOEQUALS" << QString();
-    QTest::newRow("drive entry") << "=C:" << QString();
-    QTest::newRow("other case") << "zu_name" << QString();
-    QTest::newRow("later wins") << "ZU_TWICE"
-                                << "second";
-    QTest::newRow("latin-1") << "ZU_LATIN1" << QString::fromUtf8("\xc3\xa9t\xc3\xa9");
-}
-
 void TestApplication::environment()
 {
-    QFETCH(QString, name);
-    QFETCH(QString, value);
-    ZuApplication* app = ZuApplication::instance();
+    // Entries without '=' or with an empty name are skipped; the later of two entries wins.
+    const ZuApplication* app = ZuApplication::instance();
     QCOMPARE(app->environment().keys().size(), 4);
-    QCOMPARE(app->environment().value(name), value);
-    const QString found = app->environmentLookup(name);
-    QCOMPARE(found.isNull(), value.isNull());
-    QCOMPARE(found, value);
+    const QList<QPair<QString, QString>> lookups = {
+        {"ZU_NAME", "value=with=equals"}, {"ZU_EMPTY", ""},
+        {"ZU_NOEQUALS", QString()},       {"=C:", QString()},
+        {"zu_name", QString()},           {"ZU_TWICE", "second"},
+        {"ZU_LATIN1", "\u00e9t\u00e9"}};
+    for (const auto& [name, value] : lookups) {
+        QCOMPARE(app->environmentLookup(name), value);
+        QCOMPARE(app->environmentLookup(name).isNull(), value.isNull());
+        QCOMPARE(app->environment().value(name), value);
+    }
 }
 
 void TestApplication::hooks()
 {
     QStringList calls;
-    RecordingHook* h[5];
-    for (int i = 0; i < 5; ++i) {
-        h[i] = new RecordingHook(QString(QChar('a' + i)), calls);
-        mHooks.emplace_back(h[i]);
-    }
+    std::vector<std::unique_ptr<RecordingHook>> h;
+    for (QChar name : QStringLiteral("abcde"))
+        h.emplace_back(new RecordingHook(name, calls));
     Receiver receiver;
     QStringList seenInHandler;
-    receiver.onTestEvent = [&] {
+    receiver.onTest = [&] {
         seenInHandler = calls;
     };
     auto dispatch = [&] {
@@ -245,53 +193,51 @@ void TestApplication::hooks()
         sendTestEvent(&receiver);
         return calls.join(' ');
     };
-
-    ZuApplication::installHookNotify(h[0]);
-    ZuApplication::installHookNotify(h[0]); // one slot only
-    ZuApplication::installHookNotify(h[1]);
-    ZuApplication::installHookNotify(h[2]);
-    ZuApplication::installHookNotify(h[3]); // table full: dropped
+    for (int i : {0, 0, 1, 2, 3}) // one slot per hook; the fourth is dropped
+        ZuApplication::installHookNotify(h[i].get());
     QCOMPARE(dispatch(), QStringLiteral("a.before b.before c.before c.after b.after a.after"));
-    QCOMPARE(seenInHandler, QStringList({"a.before", "b.before", "c.before"}));
-
+    QCOMPARE(seenInHandler.join(' '), QStringLiteral("a.before b.before c.before"));
     // b removes itself during dispatch: no after-call, the others keep their places.
     h[1]->removeSelf = true;
     QCOMPARE(dispatch(), QStringLiteral("a.before b.before c.before c.after a.after"));
-
-    ZuApplication::deInstallHookNotify(h[0]); // slot 0 free, c stays in slot 2
-    ZuApplication::deInstallHookNotify(h[4]); // not installed: ignored
+    ZuApplication::deInstallHookNotify(h[0].get()); // slot 0 free, c stays in slot 2
+    ZuApplication::deInstallHookNotify(h[4].get()); // not installed: ignored
     QCOMPARE(dispatch(), QStringLiteral("c.before c.after"));
-    ZuApplication::installHookNotify(h[3]); // first free slot: 0
-    ZuApplication::installHookNotify(h[4]); // then slot 1
+    ZuApplication::installHookNotify(h[3].get()); // first free slot: 0
+    ZuApplication::installHookNotify(h[4].get()); // then slot 1
     QCOMPARE(dispatch(), QStringLiteral("d.before e.before c.before c.after e.after d.after"));
+    for (auto& hook : h)
+        ZuApplication::deInstallHookNotify(hook.get());
 }
 
 void TestApplication::wheelGrab()
 {
     QStringList calls;
-    auto* hook = new RecordingHook(QStringLiteral("h"), calls);
-    mHooks.emplace_back(hook);
-    ZuApplication::installHookNotify(hook);
+    RecordingHook hook('h', calls);
+    ZuApplication::installHookNotify(&hook);
     Receiver underPointer, a;
+    underPointer.setObjectName(QStringLiteral(" under"));
     auto* b = new Receiver;
-
+    auto wheel = [&] {
+        QWheelEvent event(QPointF(5, 5), QPointF(5, 5), QPoint(), QPoint(0, 120), Qt::NoButton,
+                          Qt::NoModifier, Qt::NoScrollPhase, false);
+        QCoreApplication::sendEvent(&underPointer, &event);
+    };
     ZuWheelGrabber::grabWheel(&a);
     ZuWheelGrabber::grabWheel(b); // b takes the grab from a
-    sendWheel(&underPointer);
+    wheel();
     sendTestEvent(&underPointer); // other events are not redirected
-    QCOMPARE(QList<int>({b->wheels, a.wheels, underPointer.wheels}), QList<int>({1, 0, 0}));
-    QCOMPARE(underPointer.tests, 1);
+    ZuApplication::deInstallHookNotify(&hook);
+    QCOMPARE(QList<int>({b->wheels, a.wheels, underPointer.wheels, underPointer.tests}),
+             QList<int>({1, 0, 0, 1}));
     // The hooks see the receiver that was asked for, not the grabber.
-    QCOMPARE(hook->receivers.mid(0, 2), QList<QObject*>({&underPointer, &underPointer}));
-
+    QCOMPARE(calls.mid(0, 2), QStringList({"h.before under", "h.after under"}));
     ZuWheelGrabber::releaseWheel(&a); // clears b's grab as well
-    sendWheel(&underPointer);
-    QCOMPARE(underPointer.wheels, 1);
-
+    wheel();
     ZuWheelGrabber::grabWheel(b);
     delete b; // a destroyed grabber ends the grab
     QCOMPARE(ZuWheelGrabber::grabObject(), nullptr);
-    sendWheel(&underPointer);
+    wheel();
     QCOMPARE(underPointer.wheels, 2);
 }
 
@@ -302,11 +248,8 @@ void TestApplication::busyNesting()
         const QCursor* cursor = QGuiApplication::overrideCursor();
         shapes << (cursor ? int(cursor->shape()) : -1);
     };
-    std::unique_ptr<ZuApplication::Busy> idle(new ZuApplication::Busy(false));
-    note(); // outside a busy phase: nothing
-    idle.reset();
     std::vector<std::unique_ptr<ZuApplication::Busy>> stack;
-    for (bool busy : {true, false, true}) {
+    for (bool busy : {false, true, false, true}) { // the first outside a busy phase: nothing
         stack.emplace_back(new ZuApplication::Busy(busy));
         note();
     }
@@ -315,21 +258,20 @@ void TestApplication::busyNesting()
         note();
     }
     const int wait = Qt::WaitCursor, arrow = Qt::ArrowCursor;
-    QCOMPARE(shapes, QList<int>({-1, wait, arrow, wait, arrow, wait, -1}));
+    QCOMPARE(shapes, QList<int>({-1, wait, arrow, wait, arrow, wait, -1, -1}));
 }
 
 void TestApplication::flushPendingEvents()
 {
     // An event that always posts the next one: each of the 19 passes delivers the posted event
-    // and, while processing, the one it posted in turn.
+    // and, while processing, the one it posted in turn. Nothing pending: no pass.
     Receiver endless;
     endless.repost = true;
     QCoreApplication::postEvent(&endless, new QEvent(kTestEvent));
     ZuApplication::flushPendingEvents();
     QCOMPARE(endless.tests, 2 * 19);
-    endless.repost = false; // the last one posted ends the chain
+    endless.repost = false;
     QTRY_COMPARE(endless.tests, 2 * 19 + 1);
-    // Nothing pending: no pass at all.
     ZuApplication::flushPendingEvents();
     QCOMPARE(endless.tests, 2 * 19 + 1);
 }
@@ -338,32 +280,27 @@ void TestApplication::splashScreen()
 {
     ZuApplication* app = ZuApplication::instance();
     QPixmap pixmap(30, 20);
-    pixmap.fill(Qt::green);
     QPointer<QSplashScreen> first = new QSplashScreen(pixmap);
     app->setSplashScreen(first);
     QVERIFY(first->isVisible());
     QPointer<QSplashScreen> second = new QSplashScreen(pixmap);
     app->setSplashScreen(second); // replaces and deletes the first
-    QVERIFY(first.isNull());
     app->setSplashScreen(second); // handed in again: kept
-    QVERIFY(!second.isNull());
+    QVERIFY(first.isNull() && !second.isNull());
     // The host deletes its splash itself; closing it later must not delete it again.
     delete second;
     app->setSplashScreen(nullptr);
-    app->setSplashScreen(new QSplashScreen(pixmap)); // and the next one is owned as before
-    app->setSplashScreen(nullptr);
+    app->setSplashScreen(new QSplashScreen(pixmap)); // owned as before, deleted at the end
 }
 
 void TestApplication::about()
 {
-    ZuApplication* app = ZuApplication::instance();
     QAction earlier(nullptr);
     QSignalSpy earlierSpy(&earlier, &QAction::triggered);
-    app->connectShowAbout(&earlier, SLOT(trigger()));
-    app->connectShowAbout(this, SLOT(aboutShown())); // drops the earlier receiver
-    app->showAbout();
-    QCOMPARE(mAboutShown, 1);
-    QCOMPARE(earlierSpy.count(), 0);
+    ZuApplication::instance()->connectShowAbout(&earlier, SLOT(trigger()));
+    ZuApplication::instance()->connectShowAbout(this, SLOT(aboutShown())); // drops the earlier
+    ZuApplication::instance()->showAbout();
+    QCOMPARE(QList<int>({mAboutShown, earlierSpy.count()}), QList<int>({1, 0}));
 }
 
 void TestApplication::protocolHandler_data()
@@ -388,13 +325,10 @@ void TestApplication::protocolHandler()
     QFETCH(QString, url);
     QFETCH(QStringList, arguments);
     QTemporaryDir dir;
-    QVERIFY(dir.isValid());
     const QString record = dir.filePath(QStringLiteral("arguments.txt"));
     qputenv("ZU_TZCONTROL_RECORD", QFile::encodeName(record));
-
-    ZuApplication* app = ZuApplication::instance();
-    QSignalSpy spy(app, &ZuApplication::protocolHandlerCalled);
-    FileOpenAccess::handle(app, file, url.isEmpty() ? QUrl() : QUrl(url));
+    QSignalSpy spy(ZuApplication::instance(), &ZuApplication::protocolHandlerCalled);
+    FileOpenAccess::handle(file, url.isEmpty() ? QUrl() : QUrl(url));
     QCOMPARE(spy.count(), arguments.isEmpty() ? 0 : 1);
     if (arguments.isEmpty()) {
         QTest::qWait(200);
@@ -414,17 +348,19 @@ void TestApplication::obstructedDeletionWaits()
     RkLogCapture capture;
     auto* window = new QWidget;
     window->setObjectName(QStringLiteral("window"));
-    auto* frame = new QWidget(window);
     new QWidget(window); // a sibling before the busy branch
-    auto* button = new QPushButton(QStringLiteral("Go"), frame);
+    auto* button = new QPushButton(QStringLiteral("Go"), new QWidget(window));
     button->setObjectName(QStringLiteral("button"));
-    button->resize(80, 30);
     window->show();
     QPointer<QWidget> guard(window);
-
     int depth = -1;
     double cpu = -1;
     bool aliveAfterLoop = false;
+    auto cpuSeconds = [] {
+        timespec now = {};
+        clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &now);
+        return double(now.tv_sec) + double(now.tv_nsec) / 1e9;
+    };
     QObject::connect(button, &QPushButton::clicked, [&] {
         depth = ZuApplication::callDepth_of_notify();
         QEventLoop loop; // stands for a modal dialog held open for a second
@@ -439,6 +375,9 @@ void TestApplication::obstructedDeletionWaits()
     QVERIFY(aliveAfterLoop);
     QVERIFY2(cpu < 0.05, qPrintable(QStringLiteral("%1 s of CPU while waiting").arg(cpu)));
     QTRY_VERIFY(guard.isNull());
+    const auto hex = [](const void* inPointer) {
+        return QString::number(quintptr(inPointer), 16);
+    };
     QCOMPARE(TestSupport::logLines(capture, "DeferredDelete", RkLogFatal),
              QStringList(QStringLiteral("deletion of [0x%1 window] in level [%2] would also "
                                         "delete [0x%3 button] which is still processing an event "
@@ -452,19 +391,20 @@ void TestApplication::obstructedDeletionWaits()
 void TestApplication::busyDescendants()
 {
     // The walk finds the busy child; the deletion also waits for a busy grandchild further
-    // down the stack, with one report, though the host asks again meanwhile.
+    // down the stack, with one report, though the host asks again meanwhile. A tree nobody of
+    // which is busy goes at once.
     RkLogCapture capture;
     QPointer<Receiver> parent = new Receiver;
     auto* child = new Receiver(parent);
     auto* grandchild = new Receiver(new Receiver(parent));
     bool aliveInGrandchild = false;
-    child->onTestEvent = [&] {
+    child->onTest = [&] {
         for (int attempt = 0; attempt < 2; ++attempt) {
             parent->deleteLater();
             QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
         }
     };
-    grandchild->onTestEvent = [&] {
+    grandchild->onTest = [&] {
         sendTestEvent(child);
         QCoreApplication::processEvents(); // the child has returned, the grandchild has not
         QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
@@ -473,9 +413,6 @@ void TestApplication::busyDescendants()
     sendTestEvent(grandchild);
     QVERIFY(aliveInGrandchild);
     QTRY_VERIFY(parent.isNull());
-    QCOMPARE(TestSupport::logLines(capture, "DeferredDelete").size(), 1);
-
-    // Nobody of the tree busy: deleted at once, nothing reported.
     QPointer<Receiver> idle = new Receiver;
     new Receiver(idle);
     idle->deleteLater();
@@ -491,7 +428,7 @@ void TestApplication::deferredDeleteReportCap()
     getTheLogInstance().setOutputLevel(RkLogOff);
     Receiver busy;
     std::vector<QPointer<QObject>> doomed;
-    busy.onTestEvent = [&] {
+    busy.onTest = [&] {
         for (int before = -1; doomed.size() <= 5000 && before < mReports;) {
             before = mReports;
             doomed.emplace_back(new QObject);
