@@ -319,9 +319,10 @@ void tst_Style::pushButtonPanelCache()
 
 void tst_Style::look()
 {
-    // The elements the style draws itself, without text (fonts differ), one to a 48 x 24 cell.
+    // The elements the style draws itself, without text (fonts differ), one to a 48 x 24 cell
+    // on grey, so that white lines show.
     QImage sheet(10 * 48, 8 * 24, QImage::Format_RGB32);
-    sheet.fill(Qt::white);
+    sheet.fill(QColor(160, 160, 160));
     QPainter painter(&sheet);
     ZuStyle* style = appStyle();
     int cell = 0;
