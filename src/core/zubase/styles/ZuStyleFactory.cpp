@@ -21,7 +21,7 @@ const struct
 {
     const char* id;
     QPalette::ColorRole role;
-} sFileRoles[] = {
+} kFileRoles[] = {
     {"WindowText", QPalette::WindowText},
     {"Button", QPalette::Button},
     {"Light", QPalette::Light},
@@ -42,7 +42,7 @@ const struct
 
 bool roleForId(const QString& inId, QPalette::ColorRole& outRole)
 {
-    for (const auto& entry : sFileRoles) {
+    for (const auto& entry : kFileRoles) {
         if (inId == QLatin1String(entry.id)) {
             outRole = entry.role;
             return true;
@@ -203,7 +203,7 @@ bool ZuStyleFactory::addStyle(const QString& inFileName)
     if (!inactive.isNull()) {
         applyGroup(inactive, QPalette::Inactive, scheme.palette);
     } else {
-        for (const auto& entry : sFileRoles) {
+        for (const auto& entry : kFileRoles) {
             scheme.palette.setBrush(
                 QPalette::Inactive, entry.role,
                 QBrush(scheme.palette.color(QPalette::Active, entry.role), Qt::SolidPattern));
