@@ -162,24 +162,21 @@ void TestDesktop::appendsToExisting()
 
 void TestDesktop::placement()
 {
+    // The centre of the first monitor that holds the rectangle (x, y, w, h) strictly inside:
+    // touching an edge, reaching the last row or column, straddling or a size that would wrap
+    // around the int range finds none and leaves the outputs alone.
     qputenv("TESSEL_MONITORS", "1920x1080-1920+0 1920x1080 1280x1024");
-    const QList<QRect> found = {QRect(100, 100, 400, 300), QRect(-1000, 1, 10, 10),
-                                QRect(3000, 500, 100, 100)};
-    const QList<QPoint> centres = {QPoint(960, 540), QPoint(-960, 540), QPoint(1920 + 640, 512)};
-    for (int i = 0; i < found.size(); ++i) {
-        const QRect r = found[i];
-        int cx = -1, cy = -1;
-        QVERIFY(ZuDesktop::getRelCenteredDisplayPos(r.x(), r.y(), r.width(), r.height(), cx, cy));
-        QCOMPARE(QPoint(cx, cy), centres[i]);
-    }
-    // Touching an edge, reaching the last row/column, straddling, or a size that would wrap
-    // around finds no monitor.
-    for (const QRect& r : {QRect(0, 100, 10, 10), QRect(100, 0, 10, 10), QRect(100, 100, 1820, 10),
-                           QRect(100, 100, 10, 980), QRect(-100, 100, 200, 10),
-                           QRect(100, 100, INT_MAX, 10), QRect(100, 100, 10, INT_MAX)}) {
-        int cx = 42, cy = 42;
-        QVERIFY(!ZuDesktop::getRelCenteredDisplayPos(r.x(), r.y(), r.width(), r.height(), cx, cy));
-        QCOMPARE(QPoint(cx, cy), QPoint(42, 42));
+    const QList<std::tuple<int, int, int, int, QPoint>> cases = {
+        {100, 100, 400, 300, QPoint(960, 540)},   {-1000, 1, 10, 10, QPoint(-960, 540)},
+        {3000, 500, 100, 100, QPoint(2560, 512)}, {0, 100, 10, 10, QPoint(42, 42)},
+        {100, 0, 10, 10, QPoint(42, 42)},         {100, 100, 1820, 10, QPoint(42, 42)},
+        {100, 100, 10, 980, QPoint(42, 42)},      {-100, 100, 200, 10, QPoint(42, 42)},
+        {100, 100, INT_MAX, 10, QPoint(42, 42)},  {100, 100, 10, INT_MAX, QPoint(42, 42)}};
+    for (const auto& [x, y, w, h, centre] : cases) {
+        QPoint found(42, 42);
+        QCOMPARE(ZuDesktop::getRelCenteredDisplayPos(x, y, w, h, found.rx(), found.ry()),
+                 centre != QPoint(42, 42));
+        QCOMPARE(found, centre);
     }
 }
 
