@@ -6,7 +6,9 @@
 #include "TestSupport.h"
 
 #include <QAction>
+#include <QProcess>
 #include <QPushButton>
+#include <QScopeGuard>
 #include <QSplashScreen>
 #include <QTemporaryDir>
 #include <QThread>
@@ -317,25 +319,51 @@ void TestApplication::protocolHandler_data()
     QTest::newRow("url with blanks")
         << QString() << "tessel://open?patient=John Doe&study=1 2"
         << QStringList({"tessel://open?patient=John%20Doe&study=1%202"});
+    QTest::newRow("program missing") << "x.cfg" << QString() << QStringList("missing");
 }
 
 void TestApplication::protocolHandler()
 {
+    // The control program gets its arguments as given; its process object reads standard error
+    // and goes away once the program has ended, or could not start.
     QFETCH(QString, file);
     QFETCH(QString, url);
     QFETCH(QStringList, arguments);
     QTemporaryDir dir;
     const QString record = dir.filePath(QStringLiteral("arguments.txt"));
     qputenv("ZU_TZCONTROL_RECORD", QFile::encodeName(record));
+    const QString program = QCoreApplication::applicationDirPath() + QStringLiteral("/tzcontrol");
+    const bool missing = arguments == QStringList("missing");
+    if (missing)
+        QVERIFY(QFile::rename(program, program + ".away"));
+    const auto restore = qScopeGuard([&] { missing&& QFile::rename(program + ".away", program); });
+    struct ProcessWatch : ZuApplication::HookNotify
+    {
+        void beforeNotify(QObject* inReceiver, QEvent* inEvent) override
+        {
+            if (auto* process = qobject_cast<QProcess*>(inReceiver)) {
+                channels << process->readChannel();
+                deleted += inEvent->type() == QEvent::DeferredDelete;
+            }
+        }
+        void afterNotify(QObject*, QEvent*) override {}
+        QList<QProcess::ProcessChannel> channels;
+        int deleted = 0;
+    } watch;
+    ZuApplication::installHookNotify(&watch);
+    const auto uninstall = qScopeGuard([&] { ZuApplication::deInstallHookNotify(&watch); });
     QSignalSpy spy(ZuApplication::instance(), &ZuApplication::protocolHandlerCalled);
     FileOpenAccess::handle(file, url.isEmpty() ? QUrl() : QUrl(url));
     QCOMPARE(spy.count(), arguments.isEmpty() ? 0 : 1);
-    if (arguments.isEmpty()) {
+    if (arguments.isEmpty())
         QTest::qWait(200);
-        QVERIFY(!QFileInfo::exists(record));
+    else
+        QTRY_COMPARE_WITH_TIMEOUT(watch.deleted, 1, 10000);
+    QCOMPARE(watch.channels.isEmpty(), arguments.isEmpty());
+    QVERIFY(!watch.channels.contains(QProcess::StandardOutput));
+    QCOMPARE(QFileInfo::exists(record), !arguments.isEmpty() && !missing);
+    if (!QFileInfo::exists(record))
         return;
-    }
-    QTRY_VERIFY_WITH_TIMEOUT(QFileInfo::exists(record), 10000);
     QFile recorded(record);
     QVERIFY(recorded.open(QIODevice::ReadOnly));
     QCOMPARE(QString::fromLocal8Bit(recorded.readAll()), arguments.join('\n') + '\n');
