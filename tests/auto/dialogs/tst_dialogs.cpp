@@ -81,19 +81,13 @@ private Q_SLOTS:
     void init();
     void cleanup();
     void setUpAndDefaultParent();
-    void placement_data();
     void placement();
-    void positionWindow_data();
-    void positionWindow();
-    void exec_data();
     void exec();
     void staticFunctions_data();
     void staticFunctions();
     void messageBoxes();
     void overwrite();
-    void messageBoxWidth_data();
     void messageBoxWidth();
-    void splashScreen_data();
     void splashScreen();
 
 private:
@@ -139,102 +133,70 @@ void TestDialogs::setUpAndDefaultParent()
     QCOMPARE(ZuProgressDialog(QStringLiteral("Busy"), QString(), 0, 5).parentWidget(), nullptr);
 }
 
-void TestDialogs::placement_data()
-{
-    QTest::addColumn<QRect>("main");
-    QTest::addColumn<QSize>("size");
-    QTest::addColumn<QString>("title");
-    QTest::addColumn<QPoint>("moveTo"); // null: not placed by the caller
-    QTest::addColumn<QPoint>("frameTopLeft");
-    const QRect main(100, 100, 400, 300);
-    const QSize size(200, 100);
-    QTest::newRow("centred") << main << size << "Centred" << QPoint() << QPoint(200, 200);
-    QTest::newRow("main over the bottom-right edge")
-        << QRect(600, 400, 400, 300) << size << "Corner" << QPoint() << QPoint(595, 495);
-    QTest::newRow("main over the left edge")
-        << QRect(-100, 50, 400, 300) << size << "Left" << QPoint() << QPoint(0, 150);
-    QTest::newRow("larger than the screen")
-        << main << QSize(1000, 700) << "Large" << QPoint() << QPoint(0, 0);
-    QTest::newRow("untitled") << main << size << "" << QPoint() << QPoint(200, 200);
-    QTest::newRow("moved by the caller")
-        << main << size << "Placed" << QPoint(33, 44) << QPoint(33, 44);
-}
-
 void TestDialogs::placement()
 {
-    QFETCH(QRect, main);
-    QFETCH(QSize, size);
-    QFETCH(QString, title);
-    QFETCH(QPoint, moveTo);
-    QFETCH(QPoint, frameTopLeft);
-    mMain->setGeometry(main);
-    RkLogCapture capture;
-    ZuDialog dialog(nullptr);
-    dialog.setWindowTitle(title);
-    dialog.resize(size);
-    if (!moveTo.isNull())
-        dialog.move(moveTo);
-    dialog.show();
-    QCOMPARE(dialog.frameGeometry().topLeft(), frameTopLeft);
-    const bool traced = !title.isEmpty() && moveTo.isNull();
-    QCOMPARE(TestSupport::logLines(capture, "ZuBase", RkLogInfo),
-             traced ? QStringList("Showed dialog: " + title) : QStringList());
-    // Shown again after being hidden: the place it was given is kept.
-    dialog.hide();
-    mMain->move(0, 0);
-    dialog.show();
-    QCOMPARE(dialog.frameGeometry().topLeft(), frameTopLeft);
-}
-
-void TestDialogs::positionWindow_data()
-{
-    QTest::addColumn<int>("align");
-    QTest::addColumn<QPoint>("pos");
-    QTest::addColumn<QPoint>("frameTopLeft");
-    // A 100 x 50 client area: a 104 x 54 frame, kept one pixel off the last row and column.
-    QTest::newRow("centre") << int(Qt::AlignCenter) << QPoint(400, 300) << QPoint(348, 273);
-    QTest::newRow("right bottom") << int(Qt::AlignRight | Qt::AlignBottom) << QPoint(400, 300)
-                                  << QPoint(296, 246);
-    QTest::newRow("left top, fits") << int(Qt::AlignLeft) << QPoint(695, 545) << QPoint(695, 545);
-    QTest::newRow("left top, kept on screen")
-        << int(Qt::AlignLeft | Qt::AlignTop) << QPoint(696, 590) << QPoint(695, 545);
-}
-
-void TestDialogs::positionWindow()
-{
-    QFETCH(int, align);
-    QFETCH(QPoint, pos);
-    QFETCH(QPoint, frameTopLeft);
-    ZuDialog dialog(nullptr);
-    dialog.resize(100, 50);
-    dialog.positionWindow(pos, Qt::AlignmentFlag(align));
-    QVERIFY(!dialog.isVisible());
-    QCOMPARE(dialog.frameGeometry().topLeft(), frameTopLeft);
-}
-
-void TestDialogs::exec_data()
-{
-    QTest::addColumn<Act>("end");
-    QTest::addColumn<int>("result"); // -1: the dialog is deleted with its parent
-    QTest::newRow("accept") << on<QDialog>([](QDialog* d) { d->accept(); }) << 1;
-    QTest::newRow("close") << on<QDialog>([](QDialog* d) { d->close(); }) << 0;
-    QTest::newRow("done(5)") << on<QDialog>([](QDialog* d) { d->done(5); }) << 5;
-    QTest::newRow("parent deleted") << Act([](QWidget* d) { delete d->parentWidget(); }) << -1;
+    // Centred on the main window's frame and kept on the 800 x 600 screen, unless the caller
+    // placed it; "Showed dialog" for a titled dialog that was not placed by the caller. Shown
+    // again, it keeps its place.
+    const QRect main(100, 100, 400, 300);
+    const QList<std::tuple<QRect, QSize, QString, QPoint, QPoint>> cases = {
+        {main, QSize(200, 100), "Centred", QPoint(), QPoint(200, 200)},
+        {QRect(600, 400, 400, 300), QSize(200, 100), "Corner", QPoint(), QPoint(595, 495)},
+        {QRect(-100, 50, 400, 300), QSize(200, 100), "Left", QPoint(), QPoint(0, 150)},
+        {main, QSize(1000, 700), "Large", QPoint(), QPoint(0, 0)},
+        {main, QSize(200, 100), "", QPoint(), QPoint(200, 200)},
+        {main, QSize(200, 100), "Placed", QPoint(33, 44), QPoint(33, 44)}};
+    for (const auto& [mainGeometry, size, title, moveTo, frameTopLeft] : cases) {
+        init(); // a fresh main window
+        mMain->setGeometry(mainGeometry);
+        RkLogCapture capture;
+        ZuDialog dialog(nullptr);
+        dialog.setWindowTitle(title);
+        dialog.resize(size);
+        if (!moveTo.isNull())
+            dialog.move(moveTo);
+        for (int shown = 0; shown < 2; ++shown, dialog.hide(), mMain->move(0, 0)) {
+            dialog.show();
+            QCOMPARE(dialog.frameGeometry().topLeft(), frameTopLeft);
+        }
+        const bool traced = !title.isEmpty() && moveTo.isNull();
+        QCOMPARE(TestSupport::logLines(capture, "ZuBase", RkLogInfo),
+                 traced ? QStringList("Showed dialog: " + title) : QStringList());
+    }
+    // positionWindow() on a dialog not created yet: a 100 x 50 client area is a 104 x 54
+    // frame, kept one pixel off the last row and column.
+    const QList<std::tuple<int, QPoint, QPoint>> positions = {
+        {Qt::AlignCenter, QPoint(400, 300), QPoint(348, 273)},
+        {Qt::AlignRight | Qt::AlignBottom, QPoint(400, 300), QPoint(296, 246)},
+        {Qt::AlignLeft, QPoint(695, 545), QPoint(695, 545)},
+        {Qt::AlignLeft | Qt::AlignTop, QPoint(696, 590), QPoint(695, 545)}};
+    for (const auto& [align, pos, frameTopLeft] : positions) {
+        ZuDialog dialog(nullptr);
+        dialog.resize(100, 50);
+        dialog.positionWindow(pos, Qt::AlignmentFlag(align));
+        QVERIFY(!dialog.isVisible());
+        QCOMPARE(dialog.frameGeometry().topLeft(), frameTopLeft);
+    }
 }
 
 void TestDialogs::exec()
 {
-    // A dialog that closes itself on close survives its exec(): the caller owns it.
-    QFETCH(Act, end);
-    QFETCH(int, result);
-    auto* parent = new QWidget;
-    QPointer<ZuDialog> dialog = new ZuDialog(parent);
-    dialog->setAttribute(Qt::WA_DeleteOnClose);
-    whenModal(end);
-    QCOMPARE(dialog->exec(), qMax(result, 0));
-    QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
-    QCOMPARE(dialog.isNull(), result < 0);
-    if (result >= 0) {
+    // A dialog that deletes itself on close survives its exec(), which the caller owns; a
+    // dialog deleted with its parent while it runs ends it as rejected.
+    const QList<QPair<Act, int>> ends = {{on<QDialog>([](QDialog* d) { d->accept(); }), 1},
+                                         {on<QDialog>([](QDialog* d) { d->close(); }), 0},
+                                         {on<QDialog>([](QDialog* d) { d->done(5); }), 5},
+                                         {[](QWidget* d) { delete d->parentWidget(); }, -1}};
+    for (const auto& [end, result] : ends) {
+        auto* parent = new QWidget;
+        QPointer<ZuDialog> dialog = new ZuDialog(parent);
+        dialog->setAttribute(Qt::WA_DeleteOnClose);
+        whenModal(end);
+        QCOMPARE(dialog->exec(), qMax(result, 0));
+        QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
+        QCOMPARE(dialog.isNull(), result < 0);
+        if (result < 0)
+            continue;
         QVERIFY(!dialog->isVisible());
         QVERIFY(!dialog->testAttribute(Qt::WA_DeleteOnClose));
         QVERIFY(!dialog->testAttribute(Qt::WA_ShowModal));
@@ -403,63 +365,50 @@ void TestDialogs::overwrite()
     }
 }
 
-void TestDialogs::messageBoxWidth_data()
-{
-    QTest::addColumn<QString>("text");
-    QTest::newRow("short") << QStringLiteral("Done.");
-    QTest::newRow("long") << QStringLiteral("A rather long message that does not fit ").repeated(6);
-}
-
 void TestDialogs::messageBoxWidth()
 {
     // W = 799: the limit is min(400, 320, 1000) = 320 pixels of the box's minimum width. A long
     // text gives up its excess, a short one keeps its width.
-    QFETCH(QString, text);
-    ZuMessageBox box(nullptr);
-    box.setIcon(QMessageBox::Warning);
-    box.setText(text);
-    QLabel* label = box.findLabel();
-    QVERIFY(label && label == box.findChild<QLabel*>(QStringLiteral("qt_msgbox_label")));
-    box.show();
-    box.layout()->activate();
-    if (text.size() > 100)
-        QCOMPARE(box.layout()->totalMinimumSize().width(), 320);
-    else
-        QCOMPARE(label->minimumWidth(), label->sizeHint().width());
-}
-
-void TestDialogs::splashScreen_data()
-{
-    QTest::addColumn<int>("parent"); // 0 the main window, 1 the splash, 2 the splash by default
-    QTest::newRow("main window") << 0;
-    QTest::newRow("splash") << 1;
-    QTest::newRow("splash as default parent") << 2;
+    for (const QString& text :
+         {QStringLiteral("Done."), QStringLiteral("Too long ").repeated(30)}) {
+        ZuMessageBox box(nullptr);
+        box.setIcon(QMessageBox::Warning);
+        box.setText(text);
+        QLabel* label = box.findLabel();
+        QVERIFY(label && label == box.findChild<QLabel*>(QStringLiteral("qt_msgbox_label")));
+        box.show();
+        box.layout()->activate();
+        if (text.size() > 100)
+            QCOMPARE(box.layout()->totalMinimumSize().width(), 320);
+        else
+            QCOMPARE(label->minimumWidth(), label->sizeHint().width());
+    }
 }
 
 void TestDialogs::splashScreen()
 {
-    // A message box closes the splash screen first, also when it sits on it, and shows the
-    // arrow cursor inside a busy phase.
-    QFETCH(int, parent);
+    // A message box closes the splash screen first, also when it is its parent or default
+    // parent, and shows the arrow cursor inside a busy phase.
     QPixmap pixmap(30, 20);
-    pixmap.fill(Qt::green);
-    QPointer<QSplashScreen> splash = new QSplashScreen(pixmap);
-    ZuApplication::instance()->setSplashScreen(splash);
-    if (parent == 2)
-        ZuApplication::instance()->setDefaultParentProvider(new Provider(splash));
-    ZuApplication::Busy busy(true);
-    bool splashGone = false;
-    int cursor = -1;
-    whenModal([&](QWidget* inModal) {
-        splashGone = splash.isNull();
-        cursor = QGuiApplication::overrideCursor()->shape();
-        click(inModal, QMessageBox::Ok);
-    });
-    QCOMPARE(ZuMessageBox::information(parent == 1 ? splash.data() : nullptr, "t", "Loaded."),
-             QMessageBox::Ok);
-    QVERIFY(splashGone);
-    QCOMPARE(cursor, int(Qt::ArrowCursor));
-    QCOMPARE(QGuiApplication::overrideCursor()->shape(), Qt::WaitCursor);
+    for (int parent : {0, 1, 2}) { // the main window, the splash, the splash by default
+        QPointer<QSplashScreen> splash = new QSplashScreen(pixmap);
+        ZuApplication::instance()->setSplashScreen(splash);
+        ZuApplication::instance()->setDefaultParentProvider(
+            new Provider(parent == 2 ? splash.data() : mMain.get()));
+        ZuApplication::Busy busy(true);
+        bool splashGone = false;
+        int cursor = -1;
+        whenModal([&](QWidget* inModal) {
+            splashGone = splash.isNull();
+            cursor = QGuiApplication::overrideCursor()->shape();
+            click(inModal, QMessageBox::Ok);
+        });
+        QCOMPARE(ZuMessageBox::information(parent == 1 ? splash.data() : nullptr, "t", "Loaded."),
+                 QMessageBox::Ok);
+        QVERIFY(splashGone);
+        QCOMPARE(cursor, int(Qt::ArrowCursor));
+        QCOMPARE(QGuiApplication::overrideCursor()->shape(), Qt::WaitCursor);
+    }
 }
 
 int main(int argc, char** argv, char** envp)

@@ -58,7 +58,6 @@ class tst_StyleFactory : public QObject
 
 private Q_SLOTS:
     void initTestCase();
-    void rejectedFiles_data();
     void rejectedFiles();
     void schemeFiles();
     void addStylesFromPath();
@@ -95,39 +94,28 @@ void tst_StyleFactory::initTestCase()
              QStringList({"Duplicate", "EmptyInactive", "Full", "NativeUpper", "UnknownClass"}));
 }
 
-void tst_StyleFactory::rejectedFiles_data()
-{
-    QTest::addColumn<QString>("file");
-    QTest::addColumn<QString>("warning");
-    const QString missing = dataFile("does-not-exist.xml");
-    const QString cannotOpen = QStringLiteral("ZuStyle: couldn't open file '%1'\n");
-    const QString noXml = QStringLiteral("ZuStyle: '%1' is no valid xml - document : %2\n");
-    QTest::newRow("missing file") << missing << cannotOpen.arg(missing);
-    QTest::newRow("directory") << dataFile("") << cannotOpen.arg(dataFile(""));
-    QTest::newRow("invalid xml") << dataFile("invalid.xml")
-                                 << noXml.arg(dataFile("invalid.xml"), "tag mismatch in line 4");
-    QTest::newRow("empty file") << dataFile("empty.xml")
-                                << noXml.arg(dataFile("empty.xml"),
-                                             "unexpected end of file in line 1");
-    // The version is tested before the root's name.
-    QTest::newRow("no version") << dataFile("missing_version.xml")
-                                << QStringLiteral("ZuStyle: version < 0.000000 is not supported\n");
-    QTest::newRow("old version, wrong root")
-        << dataFile("old_palette.xml")
-        << QStringLiteral("ZuStyle: version < 0.900000 is not supported\n");
-    QTest::newRow("wrong root") << dataFile("wrong_root.xml")
-                                << QStringLiteral("ZuStyle: document is no color scheme\n");
-}
-
 void tst_StyleFactory::rejectedFiles()
 {
-    QFETCH(QString, file);
-    QFETCH(QString, warning);
-    const QStringList namesBefore = mFactory.styleNames();
-    RkLogCapture capture;
-    QVERIFY(!mFactory.addStyle(file));
-    QCOMPARE(TestSupport::logLines(capture, nullptr, RkLogWarning), QStringList(warning));
-    QCOMPARE(mFactory.styleNames(), namesBefore);
+    // One warning each, nothing stored; the version is tested before the root's name.
+    const QString open = QStringLiteral("ZuStyle: couldn't open file '%1'\n");
+    const QString noXml = QStringLiteral("ZuStyle: '%1' is no valid xml - document : %2\n");
+    const QString version = QStringLiteral("ZuStyle: version < %1 is not supported\n");
+    const QList<QPair<QString, QString>> files = {
+        {dataFile("missing.xml"), open.arg(dataFile("missing.xml"))},
+        {dataFile(""), open.arg(dataFile(""))},
+        {dataFile("invalid.xml"), noXml.arg(dataFile("invalid.xml"), "tag mismatch in line 4")},
+        {dataFile("empty.xml"),
+         noXml.arg(dataFile("empty.xml"), "unexpected end of file in line 1")},
+        {dataFile("missing_version.xml"), version.arg("0.000000")},
+        {dataFile("old_palette.xml"), version.arg("0.900000")},
+        {dataFile("wrong_root.xml"), QStringLiteral("ZuStyle: document is no color scheme\n")}};
+    const QStringList names = mFactory.styleNames();
+    for (const auto& [file, warning] : files) {
+        RkLogCapture capture;
+        QVERIFY(!mFactory.addStyle(file));
+        QCOMPARE(TestSupport::logLines(capture, nullptr, RkLogWarning), QStringList(warning));
+    }
+    QCOMPARE(mFactory.styleNames(), names);
 }
 
 void tst_StyleFactory::schemeFiles()
