@@ -164,6 +164,17 @@ void tst_StyleFactory::schemeFiles()
     QCOMPARE(schemes.value(QStringLiteral("Full")).priority, 7);
     QCOMPARE(schemes.value(QStringLiteral("EmptyInactive")).translateName, false); // "TRUE"
     QCOMPARE(schemes.value(QStringLiteral("EmptyInactive")).priority, 0);
+    const QList<QPair<QByteArray, bool>> flags = {
+        {"true", true}, {"1", true}, {"On", false}, {"yes", false}};
+    for (const auto& [value, flag] : flags) {
+        QFile file(mTemp.filePath(QStringLiteral("translate.xml")));
+        QVERIFY(file.open(QIODevice::WriteOnly | QIODevice::Truncate));
+        file.write(QByteArray("<ColorScheme Version=\"1\" Name=\"T\" TranslateName=\"") + value +
+                   "\"/>");
+        file.close();
+        QVERIFY(mFactory.addStyle(file.fileName()));
+        QCOMPARE(ZuStyleFactoryPrivate::get(mFactory)->schemes.value("T").translateName, flag);
+    }
 }
 
 void tst_StyleFactory::addStylesFromPath()
