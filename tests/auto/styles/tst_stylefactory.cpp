@@ -1,62 +1,45 @@
-// Colour-scheme files, the style factory's palettes and switching, and styled widgets.
+// Colour-scheme files, the style factory's switching and widget trees, and styled widgets. The
+// scheme files under tests/data/style are read once, before any switch, so that the roles
+// they leave out keep the starting palette; every test function then stands alone.
 #include "zubase/ZuApplication.h"
 #include "zubase/ZuStyle.h"
 #include "zubase/ZuStyleFactory.h"
-#include "zubase/styles/ZuStyleFactory_p.h"
 #include "zubase/ZuStyledWidget.h"
+#include "zubase/styles/ZuStyleFactory_p.h"
 
-#include "rklib/RkLogFile.h"
+#include "TestSupport.h"
 
-#include <QApplication>
-#include <QPointer>
 #include <QPushButton>
 #include <QStyleFactory>
 #include <QTemporaryDir>
-#include <QWidget>
-#include <QtTest>
-
-#include <memory>
 
 namespace {
 
-const QString sDataDir = QStringLiteral(ZUBASE_TEST_DATA_DIR "/style");
-
 QString dataFile(const char* inName)
 {
-    return sDataDir + QLatin1Char('/') + QLatin1String(inName);
+    return TestSupport::dataPath("style/") + QLatin1String(inName);
 }
 
-QString writeFile(const QTemporaryDir& inDir, const QString& inName, const QString& inText)
+// A scheme named inName with an Active Midlight and a Button colour that is also its
+// user-defined "Panel" colour, written to a file of the folder.
+QString writeScheme(const QTemporaryDir& inDir, const QString& inName, const QColor& inMidlight,
+                    const QColor& inPanel)
 {
-    const QString path = inDir.filePath(inName);
-    QFile file(path);
-    if (!file.open(QIODevice::WriteOnly))
-        return QString();
-    file.write(inText.toUtf8());
-    return path;
-}
-
-// A scheme with a name, an Active Midlight, and a Button colour that is also its user-defined
-// "Panel" colour.
-QString schemeText(const QString& inName, const QColor& inMidlight, const QColor& inPanel)
-{
-    auto rgb = [](const QColor& color) {
+    auto rgb = [](const QColor& c) {
         return QStringLiteral("Red=\"%1\" Green=\"%2\" Blue=\"%3\"")
-            .arg(color.red())
-            .arg(color.green())
-            .arg(color.blue());
+            .arg(c.red())
+            .arg(c.green())
+            .arg(c.blue());
     };
-    return QStringLiteral("<ColorScheme Version=\"1.0\" Name=\"%1\"><Active>"
-                          "<Color Id=\"Midlight\" %2/><Color Id=\"Button\" %3/></Active>"
-                          "<UserDefined><Color Id=\"Panel\" %3/></UserDefined></ColorScheme>")
-        .arg(inName, rgb(inMidlight), rgb(inPanel));
-}
-
-const ZuColorScheme* scheme(const QString& inName)
-{
-    const auto* d = ZuStyleFactoryPrivate::get(ZuStyleFactory::instance());
-    const auto it = d->schemes.constFind(inName);
-    return it == d->schemes.constEnd() ? nullptr : &*it;
+    const QString path = inDir.filePath(inName + QStringLiteral(".xml"));
+    QFile file(path);
+    file.open(QIODevice::WriteOnly);
+    file.write(QStringLiteral("<ColorScheme Version=\"1.0\" Name=\"%1\"><Active><Color Id="
+                              "\"Midlight\" %2/><Color Id=\"Button\" %3/></Active><UserDefined>"
+                              "<Color Id=\"Panel\" %3/></UserDefined></ColorScheme>")
+                   .arg(inName, rgb(inMidlight), rgb(inPanel))
+                   .toUtf8());
+    return path;
 }
 
 // Counts the events it sees once installed as a notify hook.
@@ -73,337 +56,257 @@ class tst_StyleFactory : public QObject
 {
     Q_OBJECT
 
-private slots:
+private Q_SLOTS:
     void initTestCase();
-    void rejectedFiles_data();
     void rejectedFiles();
-    void schemePalettes();
-    void translateName_data();
-    void translateName();
+    void schemeFiles();
     void addStylesFromPath();
-    void setCurrentStyleSignalsOnce();
-    void tesselNative_data();
+    void switching();
     void tesselNative();
     void nativeClass();
-    void styleForWidgetTree();
+    void widgetTrees();
     void themeChangeObserver();
-    void styledWidgetColours_data();
-    void styledWidgetColours();
-    void widgetsFollowSchemeSwitch();
+    void styledWidget();
+    void styledWidgetsFollowSwitch();
 
 private:
-    QPalette mNativePalette;
+    ZuStyleFactory& mFactory = ZuStyleFactory::instance();
+    QPalette mStart;
     QString mNativeClass;
     QTemporaryDir mTemp;
 };
 
 void tst_StyleFactory::initTestCase()
 {
-    QVERIFY(mTemp.isValid());
-    mNativePalette = QGuiApplication::palette();
+    // Before any scheme, every answer is a fallback.
+    QCOMPARE(mFactory.count(), 0u);
+    QVERIFY(mFactory.currentStyle().isEmpty());
+    QCOMPARE(mFactory.userDefinedColor(QStringLiteral("Panel"), Qt::magenta), QColor(Qt::magenta));
+    QCOMPARE(mFactory.standardPalette(), QPalette());
+    QVERIFY(!mFactory.currentStyleIsOSNative() && mFactory.showToolCardChooserButton());
+    QVERIFY(mFactory.showSplitterButton());
+    mStart = QGuiApplication::palette();
     mNativeClass = QApplication::style()->objectName();
-    QVERIFY(!mNativeClass.isEmpty());
-
-    // Before any scheme.
-    ZuStyleFactory& factory = ZuStyleFactory::instance();
-    QCOMPARE(factory.count(), 0u);
-    QVERIFY(factory.currentStyle().isEmpty());
-    QCOMPARE(factory.userDefinedColor(QStringLiteral("Panel"), Qt::magenta), QColor(Qt::magenta));
-    QCOMPARE(factory.standardPalette(), QPalette());
-    QVERIFY(!factory.currentStyleIsOSNative());
-    QVERIFY(factory.showToolCardChooserButton());
-}
-
-void tst_StyleFactory::rejectedFiles_data()
-{
-    QTest::addColumn<QString>("file");
-    QTest::addColumn<QString>("warning");
-
-    const QString missing = sDataDir + QStringLiteral("/does-not-exist.xml");
-    const QString cannotOpen = QStringLiteral("ZuStyle: couldn't open file '%1'\n");
-    const QString noXml = QStringLiteral("ZuStyle: '%1' is no valid xml - document : %2\n");
-    QTest::newRow("missing file") << missing << cannotOpen.arg(missing);
-    QTest::newRow("directory") << sDataDir << cannotOpen.arg(sDataDir);
-    QTest::newRow("invalid xml") << dataFile("invalid.xml")
-                                 << noXml.arg(dataFile("invalid.xml"), "tag mismatch in line 4");
-    QTest::newRow("empty file") << dataFile("empty.xml")
-                                << noXml.arg(dataFile("empty.xml"),
-                                             "unexpected end of file in line 1");
-    // The version is tested before the root's name.
-    QTest::newRow("no version") << dataFile("missing_version.xml")
-                                << QStringLiteral("ZuStyle: version < 0.000000 is not supported\n");
-    QTest::newRow("old version, wrong root")
-        << dataFile("old_palette.xml")
-        << QStringLiteral("ZuStyle: version < 0.900000 is not supported\n");
-    QTest::newRow("wrong root") << dataFile("wrong_root.xml")
-                                << QStringLiteral("ZuStyle: document is no color scheme\n");
+    for (const char* name : {"full.xml", "empty_inactive.xml", "duplicate_first.xml",
+                             "duplicate_second.xml", "native_upper.xml", "unknown_class.xml"})
+        QVERIFY2(mFactory.addStyle(dataFile(name)), name);
+    QCOMPARE(mFactory.styleNames(),
+             QStringList({"Duplicate", "EmptyInactive", "Full", "NativeUpper", "UnknownClass"}));
 }
 
 void tst_StyleFactory::rejectedFiles()
 {
-    QFETCH(QString, file);
-    QFETCH(QString, warning);
-    ZuStyleFactory& factory = ZuStyleFactory::instance();
-    const QStringList namesBefore = factory.styleNames();
-
-    RkLogCapture capture;
-    QVERIFY(!factory.addStyle(file));
-    QCOMPARE(int(capture.entries().size()), 1);
-    QCOMPARE(capture.entries().front().level, RkLogWarning);
-    QCOMPARE(QString::fromStdString(capture.entries().front().text), warning);
-    QCOMPARE(factory.styleNames(), namesBefore);
+    // One warning each, nothing stored; the version is tested before the root's name.
+    const QString open = QStringLiteral("ZuStyle: couldn't open file '%1'\n");
+    const QString noXml = QStringLiteral("ZuStyle: '%1' is no valid xml - document : %2\n");
+    const QString version = QStringLiteral("ZuStyle: version < %1 is not supported\n");
+    const QList<QPair<QString, QString>> files = {
+        {dataFile("missing.xml"), open.arg(dataFile("missing.xml"))},
+        {dataFile(""), open.arg(dataFile(""))},
+        {dataFile("invalid.xml"), noXml.arg(dataFile("invalid.xml"), "tag mismatch in line 4")},
+        {dataFile("empty.xml"),
+         noXml.arg(dataFile("empty.xml"), "unexpected end of file in line 1")},
+        {dataFile("missing_version.xml"), version.arg("0.000000")},
+        {dataFile("old_palette.xml"), version.arg("0.900000")},
+        {dataFile("wrong_root.xml"), QStringLiteral("ZuStyle: document is no color scheme\n")}};
+    const QStringList names = mFactory.styleNames();
+    for (const auto& [file, warning] : files) {
+        RkLogCapture capture;
+        QVERIFY(!mFactory.addStyle(file));
+        QCOMPARE(TestSupport::logLines(capture, nullptr, RkLogWarning), QStringList(warning));
+    }
+    QCOMPARE(mFactory.styleNames(), names);
 }
 
-void tst_StyleFactory::schemePalettes()
+void tst_StyleFactory::schemeFiles()
 {
-    const QPalette start = QGuiApplication::palette();
-    RkLogCapture capture;
-    QVERIFY(ZuStyleFactory::instance().addStyle(dataFile("full.xml")));
-    QVERIFY(ZuStyleFactory::instance().addStyle(dataFile("empty_inactive.xml")));
-    QVERIFY(capture.entries().empty());
-
-    const ZuColorScheme* full = scheme(QStringLiteral("Full"));
-    QVERIFY(full);
-    QCOMPARE(full->styleClass, QStringLiteral("ZuStyle"));
-    QCOMPARE(full->translateName, true);
-    QCOMPARE(full->priority, 7);
-    const QPalette& p = full->palette;
+    mFactory.setCurrentStyle(QStringLiteral("Full"));
+    const QPalette p = mFactory.standardPalette();
     // The later entry of the first Active element wins; "window" and the second Active do not.
     QCOMPARE(p.color(QPalette::Active, QPalette::Window), QColor(10, 20, 30));
-    QCOMPARE(p.color(QPalette::Active, QPalette::Base), QColor(250, 251, 252));
-    QCOMPARE(p.color(QPalette::Active, QPalette::Text), QColor(5, 6, 0));
-    QCOMPARE(p.brush(QPalette::Active, QPalette::Window).style(), Qt::SolidPattern);
+    QCOMPARE(p.color(QPalette::Active, QPalette::Text), QColor(5, 6, 0)); // no Blue: 0
+    QCOMPARE(p.brush(QPalette::Active, QPalette::Base).style(), Qt::SolidPattern);
     QCOMPARE(p.color(QPalette::Disabled, QPalette::Text), QColor(128, 129, 130));
-    // Roles the file does not set keep the application's colours of the moment.
+    // Roles the file does not set keep the colours the application had when it was read.
     for (auto role : {QPalette::Button, QPalette::ToolTipBase})
-        QCOMPARE(p.color(QPalette::Active, role), start.color(QPalette::Active, role));
+        QCOMPARE(p.color(QPalette::Active, role), mStart.color(QPalette::Active, role));
     QCOMPARE(p.color(QPalette::Disabled, QPalette::Window),
-             start.color(QPalette::Disabled, QPalette::Window));
-    // No Inactive element: Inactive copies Active in every role a file can set; the other roles
-    // keep the starting colours, whose Inactive and Active agree.
+             mStart.color(QPalette::Disabled, QPalette::Window));
+    // No Inactive element: Inactive copies Active in every role a file can set.
     for (int role = 0; role < QPalette::NColorRoles; ++role) {
         const auto r = QPalette::ColorRole(role);
         QCOMPARE(p.color(QPalette::Inactive, r), p.color(QPalette::Active, r));
     }
-    // First entry per id wins; only the first UserDefined element counts.
-    QCOMPARE(full->userDefinedColors.keys(), QStringList({"", "PanelBackground", "PanelText"}));
-    QCOMPARE(full->userDefinedColors.value(QStringLiteral("PanelBackground")), QColor(11, 22, 33));
+    // The first entry of an Id wins, an entry without Id is kept under the empty name, and only
+    // the first UserDefined element counts.
+    QCOMPARE(mFactory.userDefinedColor(QStringLiteral("PanelBackground"), Qt::red),
+             QColor(11, 22, 33));
+    QCOMPARE(mFactory.userDefinedColor(QString(), Qt::red), QColor(77, 77, 77));
+    QCOMPARE(mFactory.userDefinedColor(QStringLiteral("Ignored"), Qt::red), QColor(Qt::red));
+    QCOMPARE(mFactory.userDefinedColor(QStringLiteral("panelbackground"), Qt::red),
+             QColor(Qt::red));
 
     // An empty Inactive element keeps the starting Inactive colours.
-    const ZuColorScheme* empty = scheme(QStringLiteral("EmptyInactive"));
-    QVERIFY(empty);
-    QCOMPARE(empty->palette.color(QPalette::Active, QPalette::Window), QColor(10, 20, 30));
-    for (auto role : {QPalette::Window, QPalette::Base})
-        QCOMPARE(empty->palette.color(QPalette::Inactive, role),
-                 start.color(QPalette::Inactive, role));
-    QCOMPARE(empty->translateName, false); // "TRUE" is not one of the accepted spellings
-    QCOMPARE(empty->priority, 0);          // "high" is no number
+    mFactory.setCurrentStyle(QStringLiteral("EmptyInactive"));
+    const QPalette e = mFactory.standardPalette();
+    QCOMPARE(e.color(QPalette::Active, QPalette::Window), QColor(10, 20, 30));
+    QCOMPARE(e.color(QPalette::Inactive, QPalette::Window),
+             mStart.color(QPalette::Inactive, QPalette::Window));
+    // A second file of the same name replaced the whole scheme, its colours too.
+    mFactory.setCurrentStyle(QStringLiteral("Duplicate"));
+    QCOMPARE(mFactory.standardPalette().color(QPalette::Window), QColor(0, 100, 0));
+    QCOMPARE(mFactory.userDefinedColor(QStringLiteral("OnlyInFirst"), Qt::red), QColor(Qt::red));
 
-    // A second file of the same name replaces the whole scheme.
-    ZuStyleFactory& factory = ZuStyleFactory::instance();
-    const unsigned int before = factory.count();
-    QVERIFY(factory.addStyle(dataFile("duplicate_first.xml")));
-    QVERIFY(scheme(QStringLiteral("Duplicate"))->userDefinedColors.contains("OnlyInFirst"));
-    QVERIFY(factory.addStyle(dataFile("duplicate_second.xml")));
-    QCOMPARE(factory.count(), before + 1);
-    const ZuColorScheme* duplicate = scheme(QStringLiteral("Duplicate"));
-    QCOMPARE(duplicate->palette.color(QPalette::Active, QPalette::Window), QColor(0, 100, 0));
-    QVERIFY(duplicate->userDefinedColors.isEmpty());
-}
-
-void tst_StyleFactory::translateName_data()
-{
-    QTest::addColumn<QString>("value");
-    QTest::addColumn<bool>("flag");
-    QTest::newRow("on") << "on" << true;
-    QTest::newRow("true") << "true" << true;
-    QTest::newRow("1") << "1" << true;
-    QTest::newRow("On") << "On" << false;
-    QTest::newRow("yes") << "yes" << false;
-    QTest::newRow("empty") << "" << false;
-}
-
-void tst_StyleFactory::translateName()
-{
-    QFETCH(QString, value);
-    QFETCH(bool, flag);
-    const QString name = QStringLiteral("Translate-") + QTest::currentDataTag();
-    const QString file =
-        writeFile(mTemp, name + QStringLiteral(".scheme"),
-                  QStringLiteral("<ColorScheme Version=\"1\" Name=\"%1\" TranslateName=\"%2\"/>")
-                      .arg(name, value));
-    QVERIFY(ZuStyleFactory::instance().addStyle(file));
-    QVERIFY(scheme(name));
-    QCOMPARE(scheme(name)->translateName, flag);
+    // The flag and the number the factory keeps for the host, without a reader of its own:
+    // exactly "on", "true" or "1"; "high" is no number.
+    const auto& schemes = ZuStyleFactoryPrivate::get(mFactory)->schemes;
+    QCOMPARE(schemes.value(QStringLiteral("Full")).translateName, true);
+    QCOMPARE(schemes.value(QStringLiteral("Full")).priority, 7);
+    QCOMPARE(schemes.value(QStringLiteral("EmptyInactive")).translateName, false); // "TRUE"
+    QCOMPARE(schemes.value(QStringLiteral("EmptyInactive")).priority, 0);
+    const QList<QPair<QByteArray, bool>> flags = {
+        {"true", true}, {"1", true}, {"On", false}, {"yes", false}};
+    for (const auto& [value, flag] : flags) {
+        QFile file(mTemp.filePath(QStringLiteral("translate.xml")));
+        QVERIFY(file.open(QIODevice::WriteOnly | QIODevice::Truncate));
+        file.write(QByteArray("<ColorScheme Version=\"1\" Name=\"T\" TranslateName=\"") + value +
+                   "\"/>");
+        file.close();
+        QVERIFY(mFactory.addStyle(file.fileName()));
+        QCOMPARE(ZuStyleFactoryPrivate::get(mFactory)->schemes.value("T").translateName, flag);
+    }
 }
 
 void tst_StyleFactory::addStylesFromPath()
 {
-    ZuStyleFactory& factory = ZuStyleFactory::instance();
     QTemporaryDir dir;
-    QVERIFY(dir.isValid());
-    writeFile(dir, QStringLiteral("b.xml"), schemeText("bScheme", Qt::white, Qt::red));
-    writeFile(dir, QStringLiteral("UPPER.XML"), schemeText("Upper", Qt::white, Qt::red));
-    writeFile(dir, QStringLiteral("notes.txt"), schemeText("Ignored", Qt::white, Qt::red));
-    writeFile(dir, QStringLiteral("broken.xml"), QStringLiteral("<ColorScheme"));
+    writeScheme(dir, QStringLiteral("bScheme"), Qt::white, Qt::red);
+    QFile::rename(writeScheme(dir, QStringLiteral("Upper"), Qt::white, Qt::red),
+                  dir.filePath(QStringLiteral("UPPER.XML")));
+    QFile::rename(writeScheme(dir, QStringLiteral("Ignored"), Qt::white, Qt::red),
+                  dir.filePath(QStringLiteral("notes.txt")));
+    QFile broken(dir.filePath(QStringLiteral("broken.xml")));
+    broken.open(QIODevice::WriteOnly);
     QVERIFY(QDir(dir.path()).mkdir(QStringLiteral("folder.xml")));
 
     RkLogCapture capture;
-    QCOMPARE(factory.addStylesFromPath(dir.path()), 2);
-    QCOMPARE(int(capture.entries().size()), 1); // the broken file's warning only
-    const QStringList names = factory.styleNames();
+    QCOMPARE(mFactory.addStylesFromPath(dir.path()), 2);
+    QCOMPARE(capture.entries().size(), size_t(1)); // the broken file's warning only
+    const QStringList names = mFactory.styleNames();
     QVERIFY(!names.contains(QStringLiteral("Ignored")));
     // Ordered by UTF-16 code units: upper case before lower case.
-    QVERIFY(names.contains(QStringLiteral("bScheme")));
     QVERIFY(names.indexOf(QStringLiteral("Upper")) < names.indexOf(QStringLiteral("bScheme")));
-    QVERIFY(std::is_sorted(names.begin(), names.end()));
-
-    QCOMPARE(factory.addStylesFromPath(dir.filePath(QStringLiteral("nowhere"))), 0);
+    QCOMPARE(mFactory.addStylesFromPath(dir.filePath(QStringLiteral("nowhere"))), 0);
 }
 
-void tst_StyleFactory::setCurrentStyleSignalsOnce()
+void tst_StyleFactory::switching()
 {
-    ZuStyleFactory& factory = ZuStyleFactory::instance();
-    QVERIFY(factory.addStyle(dataFile("unknown_class.xml")));
-    const QPalette expected = scheme(QStringLiteral("Full"))->palette;
-
-    QSignalSpy spy(&factory, &ZuStyleFactory::paletteChanged);
+    mFactory.setCurrentStyle(QStringLiteral("Duplicate"));
+    QSignalSpy spy(&mFactory, &ZuStyleFactory::paletteChanged);
     QColor windowAtSignal;
     bool zuStyleAtSignal = false;
-    const QMetaObject::Connection connection =
-        connect(&factory, &ZuStyleFactory::paletteChanged, this, [&] {
-            windowAtSignal = QGuiApplication::palette().color(QPalette::Window);
-            zuStyleAtSignal = dynamic_cast<ZuStyle*>(QApplication::style()) != nullptr;
-        });
-    factory.setCurrentStyle(QStringLiteral("Full"));
-    QCOMPARE(spy.count(), 1);
-    QCOMPARE(factory.currentStyle(), QStringLiteral("Full"));
+    const auto connection = connect(&mFactory, &ZuStyleFactory::paletteChanged, this, [&] {
+        windowAtSignal = QGuiApplication::palette().color(QPalette::Window);
+        zuStyleAtSignal = dynamic_cast<ZuStyle*>(QApplication::style());
+    });
+    mFactory.setCurrentStyle(QStringLiteral("Full"));
     // Palette and style are both in place when the signal goes out.
     QCOMPARE(windowAtSignal, QColor(10, 20, 30));
     QVERIFY(zuStyleAtSignal);
-    QCOMPARE(QGuiApplication::palette(), expected);
-    QCOMPARE(factory.standardPalette(), expected);
-
-    factory.setCurrentStyle(QStringLiteral("Full"));
-    factory.setCurrentStyle(QStringLiteral("No such scheme"));
-    factory.setCurrentStyle(QStringLiteral("UnknownClass"));
-    QCOMPARE(spy.count(), 1);
-    QCOMPARE(factory.currentStyle(), QStringLiteral("Full"));
-    QVERIFY(dynamic_cast<ZuStyle*>(QApplication::style()));
+    QCOMPARE(QGuiApplication::palette(), mFactory.standardPalette());
+    // The same scheme again, an unknown one, or one whose style cannot be made: nothing.
+    for (const char* name : {"Full", "No such scheme", "UnknownClass"})
+        mFactory.setCurrentStyle(QLatin1String(name));
     disconnect(connection);
-
-    QCOMPARE(factory.userDefinedColor(QStringLiteral("PanelBackground"), Qt::red),
-             QColor(11, 22, 33));
-    QCOMPARE(factory.userDefinedColor(QStringLiteral("panelbackground"), Qt::red), QColor(Qt::red));
-    QCOMPARE(factory.userDefinedColor(QString(), Qt::blue), QColor(77, 77, 77)); // exact match
+    QCOMPARE(spy.count(), 1);
+    QCOMPARE(mFactory.currentStyle(), QStringLiteral("Full"));
 
     // A file read now takes the roles it leaves out from the scheme in force.
-    QVERIFY(factory.addStyle(
-        writeFile(mTemp, QStringLiteral("later.xml"),
-                  QStringLiteral("<ColorScheme Version=\"1.0\" Name=\"Later\"><Active>"
-                                 "<Color Id=\"Base\" Red=\"1\" Green=\"1\" Blue=\"1\"/>"
-                                 "</Active></ColorScheme>"))));
-    const QPalette& later = scheme(QStringLiteral("Later"))->palette;
-    QCOMPARE(later.color(QPalette::Active, QPalette::Window), QColor(10, 20, 30));
-    QCOMPARE(later.color(QPalette::Active, QPalette::Base), QColor(1, 1, 1));
-}
-
-void tst_StyleFactory::tesselNative_data()
-{
-    QTest::addColumn<QColor>("midlight");
-    QTest::addColumn<bool>("tessel");
-    QTest::newRow("201 grey") << QColor(201, 201, 201) << true;
-    QTest::newRow("200 grey") << QColor(200, 200, 200) << false;
-    QTest::newRow("white") << QColor(255, 255, 255) << true;
-    QTest::newRow("cyan") << QColor(0, 255, 255) << false;          // (16+5)*255 >> 5 = 167
-    QTest::newRow("light yellow") << QColor(255, 255, 120) << true; // (27*255+600) >> 5 = 233
-    QTest::newRow("black") << QColor(0, 0, 0) << false;
+    QVERIFY(mFactory.addStyle(writeScheme(mTemp, QStringLiteral("Later"), Qt::white, Qt::red)));
+    mFactory.setCurrentStyle(QStringLiteral("Later"));
+    QCOMPARE(mFactory.standardPalette().color(QPalette::Window), QColor(10, 20, 30));
+    QCOMPARE(mFactory.standardPalette().color(QPalette::Button), QColor(Qt::red));
 }
 
 void tst_StyleFactory::tesselNative()
 {
-    QFETCH(QColor, midlight);
-    QFETCH(bool, tessel);
-    ZuStyleFactory& factory = ZuStyleFactory::instance();
-    const QString name = QStringLiteral("Midlight ") + QTest::currentDataTag();
-    QVERIFY(factory.addStyle(
-        writeFile(mTemp, name + QStringLiteral(".xml"), schemeText(name, midlight, Qt::red))));
-    factory.setCurrentStyle(name);
-    QCOMPARE(factory.currentStyle(), name);
-    QCOMPARE(factory.currentStyleIsTesselNative(), tessel);
-    QVERIFY(!factory.currentStyleIsOSNative());
+    // Light when (11 red + 16 green + 5 blue) >> 5 is above 200.
+    const QList<QPair<QColor, bool>> cases = {{QColor(201, 201, 201), true},
+                                              {QColor(200, 200, 200), false},
+                                              {QColor(0, 255, 255), false},  // 167
+                                              {QColor(255, 255, 120), true}, // 233
+                                              {QColor(255, 0, 255), false}}; // 127
+    for (const auto& [midlight, tessel] : cases) {
+        const QString name = QStringLiteral("Midlight ") + midlight.name();
+        QVERIFY(mFactory.addStyle(writeScheme(mTemp, name, midlight, Qt::red)));
+        mFactory.setCurrentStyle(name);
+        QCOMPARE(mFactory.currentStyleIsTesselNative(), tessel);
+        QVERIFY(!mFactory.currentStyleIsOSNative());
+    }
 }
 
 void tst_StyleFactory::nativeClass()
 {
-    ZuStyleFactory& factory = ZuStyleFactory::instance();
-    QVERIFY(factory.addStyle(dataFile("native_upper.xml")));
-    QCOMPARE(scheme(QStringLiteral("NativeUpper"))->styleClass, mNativeClass);
-
     using Style = std::unique_ptr<QStyle>;
-    const Style fromFile(factory.createStyleFromName(QStringLiteral("NativeUpper")));
-    const Style fromClass(factory.createStyleFromClass(QStringLiteral("native")));
     const Style platform(QStyleFactory::create(mNativeClass));
-    QVERIFY(fromFile && fromClass && platform);
+    const Style fromFile(mFactory.createStyleFromName(QStringLiteral("NativeUpper")));
+    const Style fromClass(mFactory.createStyleFromClass(QStringLiteral("native")));
+    QVERIFY(platform && fromFile && fromClass);
     QCOMPARE(fromFile->metaObject()->className(), platform->metaObject()->className());
     QCOMPARE(fromClass->metaObject()->className(), platform->metaObject()->className());
-    QVERIFY(!dynamic_cast<ZuStyle*>(fromClass.get()));
+    QVERIFY(dynamic_cast<ZuStyle*>(Style(mFactory.createStyleFromClass("zuSTYLE")).get()));
+    QVERIFY(!mFactory.createStyleFromClass(QStringLiteral("NoSuchStyle")));
+    QVERIFY(!mFactory.createStyleFromName(QStringLiteral("No such scheme")));
 
-    const Style own(factory.createStyleFromClass(QStringLiteral("zuSTYLE")));
-    QVERIFY(dynamic_cast<ZuStyle*>(own.get()));
-    QVERIFY(!factory.createStyleFromClass(QStringLiteral("NoSuchStyle")));
-    QVERIFY(!factory.createStyleFromName(QStringLiteral("No such scheme")));
-
-    factory.setCurrentStyle(QStringLiteral("NativeUpper"));
-    QCOMPARE(factory.currentStyle(), QStringLiteral("NativeUpper"));
-    QVERIFY(factory.currentStyleIsOSNative());
-    QVERIFY(!factory.showToolCardChooserButton());
+    mFactory.setCurrentStyle(QStringLiteral("NativeUpper"));
+    QVERIFY(mFactory.currentStyleIsOSNative());
+    QVERIFY(!mFactory.showToolCardChooserButton());
     QVERIFY(!dynamic_cast<ZuStyle*>(QApplication::style()));
-    factory.setCurrentStyle(QStringLiteral("Full"));
-    QVERIFY(!factory.currentStyleIsOSNative());
-    QVERIFY(factory.showToolCardChooserButton());
+    mFactory.setCurrentStyle(QStringLiteral("Full"));
+    QVERIFY(!mFactory.currentStyleIsOSNative());
 }
 
-void tst_StyleFactory::styleForWidgetTree()
+void tst_StyleFactory::widgetTrees()
 {
-    ZuStyleFactory& factory = ZuStyleFactory::instance();
     QWidget top;
     auto* child = new QWidget(&top);
     const QList<QWidget*> tree = {&top, child, new QWidget(child)};
     QStyle* before = top.style();
+    QVERIFY(!mFactory.setStyleForWidget(QStringLiteral("No such scheme"), &top));
+    QVERIFY(!mFactory.setStyleForWidget(QStringLiteral("UnknownClass"), &top));
+    QVERIFY(!mFactory.setStyleForWidget(QStringLiteral("Full"), nullptr));
+    QCOMPARE(child->style(), before);
 
-    QVERIFY(!factory.setStyleForWidget(QStringLiteral("No such scheme"), &top));
-    QVERIFY(!factory.setStyleForWidget(QStringLiteral("UnknownClass"), &top));
-    for (QWidget* widget : tree)
-        QCOMPARE(widget->style(), before);
-
-    // Every widget of the tree keeps every colour of the scheme, also those the file left out.
-    QVERIFY(factory.setStyleForWidget(QStringLiteral("Duplicate"), &top));
+    // Every widget keeps every colour of the scheme, also those the file left out.
+    mFactory.setCurrentStyle(QStringLiteral("Full"));
+    QVERIFY(mFactory.setStyleForWidget(QStringLiteral("Duplicate"), &top));
     QVERIFY(dynamic_cast<ZuStyle*>(top.style()));
-    const QPalette& duplicate = scheme(QStringLiteral("Duplicate"))->palette;
     for (QWidget* widget : tree) {
         QCOMPARE(widget->style(), top.style());
-        QCOMPARE(widget->palette().color(QPalette::Active, QPalette::Window), QColor(0, 100, 0));
-        QCOMPARE(widget->palette().color(QPalette::Active, QPalette::Base),
-                 duplicate.color(QPalette::Active, QPalette::Base));
+        QCOMPARE(widget->palette().color(QPalette::Window), QColor(0, 100, 0));
+        QCOMPARE(widget->palette().color(QPalette::Base), mStart.color(QPalette::Base));
     }
+    // One style object per class, however many trees are styled.
+    QWidget other;
+    QVERIFY(mFactory.setStyleForWidget(QStringLiteral("EmptyInactive"), &other));
+    QCOMPARE(other.style(), top.style());
 
-    QVERIFY(factory.setNativeStyleForWidget(&top));
-    const std::unique_ptr<QStyle> platform(QStyleFactory::create(mNativeClass));
-    for (QWidget* widget : tree) {
-        QCOMPARE(widget->style(), top.style());
-        QCOMPARE(widget->style()->metaObject()->className(), platform->metaObject()->className());
-        QCOMPARE(widget->palette().color(QPalette::Active, QPalette::Window),
-                 mNativePalette.color(QPalette::Active, QPalette::Window));
-    }
+    QVERIFY(mFactory.setNativeStyleForWidget(&top));
+    QVERIFY(mFactory.setNativeStyleForWidget(&other));
+    QVERIFY(mFactory.setStyleForWidget(QStringLiteral("NativeUpper"), child));
+    QCOMPARE(other.style(), top.style());
+    QCOMPARE(child->style(), top.style());
+    QCOMPARE(
+        top.style()->metaObject()->className(),
+        std::unique_ptr<QStyle>(QStyleFactory::create(mNativeClass))->metaObject()->className());
+    QCOMPARE(tree.last()->palette().color(QPalette::Window), mStart.color(QPalette::Window));
 }
 
 void tst_StyleFactory::themeChangeObserver()
 {
-    // The factory's observer sees the events the application dispatches, whatever the receiver.
-    ZuStyleFactory& factory = ZuStyleFactory::instance();
-    factory.setCurrentStyle(QStringLiteral("Full"));
-    QPalette other = factory.standardPalette();
+    // The observer puts the scheme palette back on a theme change, whatever the receiver.
+    mFactory.setCurrentStyle(QStringLiteral("Full"));
+    QPalette other = mFactory.standardPalette();
     other.setColor(QPalette::Window, Qt::yellow);
     QApplication::setPalette(other);
     QWidget window;
@@ -412,89 +315,68 @@ void tst_StyleFactory::themeChangeObserver()
     QCOMPARE(QGuiApplication::palette().color(QPalette::Window), QColor(Qt::yellow));
     QEvent themeChange(QEvent::ThemeChange);
     QCoreApplication::sendEvent(&window, &themeChange);
-    QCOMPARE(QGuiApplication::palette(), factory.standardPalette());
+    QCOMPARE(QGuiApplication::palette(), mFactory.standardPalette());
 
-    // The observer leaves with its factory. The application holds three hooks and drops any
-    // further one: with the process-wide factory's observer and a second factory's in place,
-    // one probe fits and one does not.
+    // The observer leaves with its factory: of the application's three hook slots, a second
+    // factory takes one, a probe the last, and a later probe fits only once it has gone.
     ZuStyleFactory* second = ZuStyleFactoryPrivate::createDetached();
     ProbeHook fits, late;
     ZuApplication::installHookNotify(&fits);
     ZuApplication::installHookNotify(&late);
     QCoreApplication::sendEvent(&window, &unrelated);
     const int lateSeenWhileFull = late.seen;
-
-    // The second factory takes its observer along, which frees the slot for the late probe.
     ZuStyleFactoryPrivate::destroyDetached(second);
     ZuApplication::installHookNotify(&late);
     QCoreApplication::sendEvent(&window, &unrelated);
-    ZuApplication::deInstallHookNotify(&fits); // before any check can return
+    ZuApplication::deInstallHookNotify(&fits);
     ZuApplication::deInstallHookNotify(&late);
-    QCOMPARE(fits.seen, 2);
-    QCOMPARE(lateSeenWhileFull, 0);
-    QCOMPARE(late.seen, 1);
+    QCOMPARE(QList<int>({fits.seen, lateSeenWhileFull, late.seen}), QList<int>({2, 0, 1}));
 }
 
-void tst_StyleFactory::styledWidgetColours_data()
+void tst_StyleFactory::styledWidget()
 {
-    QTest::addColumn<bool>("named");        // names set at all
-    QTest::addColumn<QByteArray>("suffix"); // of "PanelText<suffix>", "PanelBackground<suffix>"
-    QTest::addColumn<bool>("defaults");     // red text and blue background
-    QTest::addColumn<QColor>("foreground");
-    QTest::addColumn<QColor>("background");
-    const QColor text(5, 6, 0), base(250, 251, 252); // the scheme's Text and Base
-    QTest::newRow("names defined")
-        << true << QByteArray() << true << QColor(240, 230, 220) << QColor(11, 22, 33);
-    QTest::newRow("unknown names, defaults")
-        << true << QByteArray("X") << true << QColor(Qt::red) << QColor(Qt::blue);
-    QTest::newRow("unknown names, no defaults") << true << QByteArray("X") << false << text << base;
-    // The scheme keeps an entry without Id under the empty name; unnamed widgets ignore it.
-    QTest::newRow("no names, no defaults") << false << QByteArray() << false << text << base;
-}
-
-void tst_StyleFactory::styledWidgetColours()
-{
-    QFETCH(bool, named);
-    QFETCH(QByteArray, suffix);
-    QFETCH(bool, defaults);
-    QFETCH(QColor, foreground);
-    QFETCH(QColor, background);
-    ZuStyleFactory::instance().setCurrentStyle(QStringLiteral("Full"));
+    // Each change applies at once, in every colour group; the rest is the scheme's palette.
+    mFactory.setCurrentStyle(QStringLiteral("Full"));
     QWidget widget;
     ZuStyledWidget styled(&widget);
-    if (named) {
-        styled.setForegroundColorName("PanelText" + suffix);
-        styled.setBackgroundColorName("PanelBackground" + suffix);
-    }
-    styled.setForegroundColorDefault(defaults ? QColor(Qt::red) : QColor());
-    styled.setBackgroundColorDefault(defaults ? QColor(Qt::blue) : QColor());
-
-    for (QPalette::ColorGroup group : {QPalette::Active, QPalette::Inactive, QPalette::Disabled}) {
-        QCOMPARE(widget.palette().color(group, QPalette::Text), foreground);
-        QCOMPARE(widget.palette().color(group, QPalette::WindowText), foreground);
-        QCOMPARE(widget.palette().color(group, QPalette::Base), background);
-    }
-    // Everything else is the scheme's.
+    auto colours = [&widget] {
+        QStringList names;
+        for (auto group : {QPalette::Active, QPalette::Inactive, QPalette::Disabled}) {
+            for (auto role : {QPalette::Text, QPalette::WindowText, QPalette::Base})
+                names << widget.palette().color(group, role).name();
+        }
+        names.removeDuplicates();
+        return names.join(' ');
+    };
+    const QString text = "#050600", base = "#fafbfc"; // the scheme's Text and Base
+    // No names: the scheme's own colours, not its entry without Id.
+    QCOMPARE(colours(), text + ' ' + base);
+    styled.setForegroundColorName("PanelText");
+    QCOMPARE(colours(), "#f0e6dc " + base);
+    styled.setBackgroundColorName("PanelBackground");
+    QCOMPARE(colours(), "#f0e6dc #0b1621");
+    styled.setForegroundColorName("Unknown");
+    QCOMPARE(colours(), text + " #0b1621");
+    styled.setForegroundColorDefault(Qt::red);
+    QCOMPARE(colours(), "#ff0000 #0b1621");
+    styled.setBackgroundColorName("Unknown");
+    QCOMPARE(colours(), "#ff0000 " + base);
+    styled.setBackgroundColorDefault(Qt::blue);
+    QCOMPARE(colours(), "#ff0000 #0000ff");
     QCOMPARE(widget.palette().color(QPalette::Window), QColor(10, 20, 30));
 }
 
-void tst_StyleFactory::widgetsFollowSchemeSwitch()
+void tst_StyleFactory::styledWidgetsFollowSwitch()
 {
-    ZuStyleFactory& factory = ZuStyleFactory::instance();
-    QVERIFY(factory.addStyle(writeFile(mTemp, QStringLiteral("red.xml"),
-                                       schemeText("RedPanel", Qt::white, QColor(200, 0, 0)))));
-    QVERIFY(factory.addStyle(writeFile(mTemp, QStringLiteral("green.xml"),
-                                       schemeText("GreenPanel", Qt::white, QColor(0, 200, 0)))));
-    factory.setCurrentStyle(QStringLiteral("RedPanel"));
-
+    QVERIFY(mFactory.addStyle(writeScheme(mTemp, "RedPanel", Qt::white, QColor(200, 0, 0))));
+    QVERIFY(mFactory.addStyle(writeScheme(mTemp, "GreenPanel", Qt::white, QColor(0, 200, 0))));
+    mFactory.setCurrentStyle(QStringLiteral("RedPanel"));
     QWidget kept;
     auto styledKept = std::make_unique<ZuStyledWidget>(&kept);
     styledKept->setBackgroundColorName("Panel");
-    auto* doomed = new QWidget;
-    QPointer<QWidget> guard(doomed);
+    QPointer<QWidget> doomed = new QWidget;
     ZuStyledWidget styledDoomed(doomed);
     styledDoomed.setBackgroundColorName("Panel");
-    QCOMPARE(kept.palette().color(QPalette::Base), QColor(200, 0, 0));
     // Push-button panels are cached per palette; none drawn in red may outlive the switch.
     QPushButton button;
     button.resize(90, 30);
@@ -504,14 +386,12 @@ void tst_StyleFactory::widgetsFollowSchemeSwitch()
     QVERIFY2(buttonCentre().red() > buttonCentre().green() + 80, qPrintable(buttonCentre().name()));
 
     delete doomed; // the handle outlives its widget
-    QVERIFY(guard.isNull());
-    factory.setCurrentStyle(QStringLiteral("GreenPanel"));
+    mFactory.setCurrentStyle(QStringLiteral("GreenPanel"));
     QCOMPARE(kept.palette().color(QPalette::Base), QColor(0, 200, 0));
     QVERIFY2(buttonCentre().green() > buttonCentre().red() + 80, qPrintable(buttonCentre().name()));
-
     // A destroyed handle no longer touches its widget.
     styledKept.reset();
-    factory.setCurrentStyle(QStringLiteral("RedPanel"));
+    mFactory.setCurrentStyle(QStringLiteral("RedPanel"));
     QCOMPARE(kept.palette().color(QPalette::Base), QColor(0, 200, 0));
 }
 
@@ -519,12 +399,9 @@ void tst_StyleFactory::widgetsFollowSchemeSwitch()
 int main(int argc, char** argv)
 {
     QCoreApplication::setAttribute(Qt::AA_Use96Dpi, true);
-    ZuApplication* application = ZuApplication::createInstance(argc, argv, nullptr);
-    if (!application)
-        return 1;
+    std::unique_ptr<ZuApplication> app(ZuApplication::createInstance(argc, argv, nullptr));
     tst_StyleFactory test;
-    const int result = QTest::qExec(&test, argc, argv);
-    delete application;
-    return result;
+    return app ? QTest::qExec(&test, argc, argv) : 1;
 }
+
 #include "tst_stylefactory.moc"

@@ -2,9 +2,13 @@
 
 #include "zubase/ZuCheck_p.h"
 #include "zubase/ZuWheelGrabber.h"
+#include "zubase/platform/SysInput.h"
+#include "zubase/platform/SysMemory.h"
+#include "zubase/platform/SysThread.h"
 
 #include <QAbstractEventDispatcher>
 #include <QEvent>
+#include <QPointer>
 #include <QProcess>
 #include <QSplashScreen>
 #include <QThread>
@@ -18,12 +22,6 @@
 #include <utility>
 #include <vector>
 
-#ifdef Q_OS_UNIX
-#include <pthread.h>
-#include <sys/mman.h>
-#include <unistd.h>
-#endif
-
 namespace {
 
 // Receivers of the notify() calls active on the main thread, outermost first.
@@ -33,7 +31,7 @@ namespace {
 // only backed by memory once touched, followed by an inaccessible guard page: it grows without
 // ever moving or being checked on the fast path. No thread's own stack can hold the frames of
 // a million nested dispatches, so the guard page is never reached before the thread's stack
-// would overflow. Elsewhere it is an ordinary array that doubles when full.
+// would overflow. Otherwise it is an ordinary array that doubles when full.
 struct NotifyStack
 {
     QObject** base = nullptr;
@@ -51,21 +49,13 @@ struct NotifyStack
     void grow();
 };
 
-#if defined(Q_OS_UNIX)
 const size_t kReserved = size_t(1) << 20;
-#endif
 
 void NotifyStack::grow()
 {
     const int used = size();
-#if defined(Q_OS_UNIX)
     if (!base) {
-        const size_t page = size_t(sysconf(_SC_PAGESIZE));
-        const size_t bytes = kReserved * sizeof(QObject*);
-        void* memory = mmap(nullptr, bytes + page, PROT_READ | PROT_WRITE,
-                            MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
-        if (memory != MAP_FAILED) {
-            mprotect(static_cast<char*>(memory) + bytes, page, PROT_NONE);
+        if (void* memory = ZuPlatform::memoryReserveWithGuard(kReserved * sizeof(QObject*))) {
             base = top = static_cast<QObject**>(memory);
             end = base + kReserved;
             reserved = true;
@@ -74,7 +64,6 @@ void NotifyStack::grow()
     }
     if (reserved)
         qFatal("ZuApplication: event dispatch nested more than %d levels", used);
-#endif
     const int capacity = base ? int(end - base) * 2 : 64;
     auto* data = static_cast<QObject**>(std::realloc(base, sizeof(QObject*) * size_t(capacity)));
     Q_CHECK_PTR(data);
@@ -101,21 +90,12 @@ Qt::HANDLE sFastPathThreadId = nullptr;
 // The main thread's id while hooks are installed (and the stack needs no capacity check).
 Qt::HANDLE sHookedPathThreadId = nullptr;
 int sDeferredDeleteReports = 0;
-const int sMaxDeferredDeleteReports = 5000;
+const int kMaxDeferredDeleteReports = 5000;
 
+// The same value as QThread::currentThreadId(), without a call: notify() asks for every event.
 inline Qt::HANDLE currentThreadHandle()
 {
-#if defined(Q_OS_LINUX) && defined(Q_PROCESSOR_X86_64) && defined(__GLIBC__)
-    // The thread's control block pointer, which is what pthread_self() and so
-    // QThread::currentThreadId() return, read without a call: notify() asks for every event.
-    Qt::HANDLE self;
-    __asm__("movq %%fs:0, %0" : "=r"(self));
-    return self;
-#elif defined(Q_OS_UNIX)
-    return reinterpret_cast<Qt::HANDLE>(pthread_self());
-#else
-    return QThread::currentThreadId();
-#endif
+    return ZuPlatform::threadCurrentId();
 }
 
 inline bool onMainThread()
@@ -141,8 +121,8 @@ inline bool isSpecialEventType(QEvent::Type inType)
 }
 
 // QObject keeps a "deleteLater() was called" flag and drops a further deferred delete while
-// the flag is set and other events are pending for the object. The postponed deletion is
-// swallowed here without deleting the object, so the flag has to go before re-posting, or the
+// the flag is set and other events are pending for the object. A postponed deletion is
+// swallowed without deleting the object, so the flag has to go before re-posting, or the
 // deletion would be lost.
 struct DeleteLaterFlag : QObject
 {
@@ -152,9 +132,66 @@ struct DeleteLaterFlag : QObject
     }
 };
 
+// Deletions that an object still handling an event obstructed. Re-posting one at once would
+// only have it delivered again in the same nested event loop, round after round; it waits
+// instead until the notify stack has dropped to the obstructing object's level (its handler
+// has returned), which the main event dispatcher's aboutToBlock() and awake() look for.
+struct PostponedDeletion
+{
+    QPointer<QObject> object;
+    int level;
+};
+std::vector<PostponedDeletion> sPostponed;
+QMetaObject::Connection sPostponedWatch[2];
+
+void retryPostponed()
+{
+    const int depth = sNotifyStack.size();
+    for (auto it = sPostponed.begin(); it != sPostponed.end();) {
+        QObject* object = it->object.data();
+        if (object && depth > it->level) {
+            ++it;
+            continue;
+        }
+        it = sPostponed.erase(it);
+        if (object) {
+            DeleteLaterFlag::clear(object);
+            object->deleteLater();
+        }
+    }
+    if (sPostponed.empty()) {
+        for (QMetaObject::Connection& connection : sPostponedWatch)
+            QObject::disconnect(connection);
+    }
+}
+
+void postpone(QObject* inObject, int inLevel)
+{
+    if (sPostponed.empty()) {
+        QAbstractEventDispatcher* dispatcher = QAbstractEventDispatcher::instance();
+        if (!dispatcher)
+            qFatal("ZuApplication: no event dispatcher to retry a postponed deletion");
+        sPostponedWatch[0] =
+            QObject::connect(dispatcher, &QAbstractEventDispatcher::aboutToBlock, &retryPostponed);
+        sPostponedWatch[1] =
+            QObject::connect(dispatcher, &QAbstractEventDispatcher::awake, &retryPostponed);
+    }
+    sPostponed.push_back({inObject, inLevel});
+}
+
+PostponedDeletion* findPostponed(QObject* inObject)
+{
+    for (PostponedDeletion& postponed : sPostponed) {
+        if (postponed.object == inObject)
+            return &postponed;
+    }
+    return nullptr;
+}
+
 // Whether deleting inReceiver now would destroy an object that is still handling an event
 // further down the notify stack. Walks the receiver's tree depth first, pre-order; each object
 // is looked up in a sorted copy of the stack, so the cost is linear in the size of the tree.
+// An obstructed deletion is postponed (above) and reported once.
 Q_NEVER_INLINE bool deferredDeleteMustWait(QObject* inReceiver, QEvent* inEvent)
 {
     const int depth = sNotifyStack.size();
@@ -174,16 +211,22 @@ Q_NEVER_INLINE bool deferredDeleteMustWait(QObject* inReceiver, QEvent* inEvent)
         return (it != active.end() && it->first == inObject) ? it->second : -1;
     };
 
+    // The first busy object in walk order is the one reported; the deletion waits for the
+    // lowest busy one of the whole tree.
     QObject* found = nullptr;
     int foundLevel = -1;
+    int waitLevel = depth;
     std::vector<QObject*> pending{inReceiver};
-    while (!pending.empty()) {
+    while (!pending.empty() && waitLevel > 0) {
         QObject* object = pending.back();
         pending.pop_back();
-        foundLevel = levelOf(object);
-        if (foundLevel >= 0) {
-            found = object;
-            break;
+        const int level = levelOf(object);
+        if (level >= 0) {
+            if (!found) {
+                found = object;
+                foundLevel = level;
+            }
+            waitLevel = std::min(waitLevel, level);
         }
         const QObjectList& children = object->children();
         for (auto it = children.crbegin(); it != children.crend(); ++it)
@@ -192,7 +235,13 @@ Q_NEVER_INLINE bool deferredDeleteMustWait(QObject* inReceiver, QEvent* inEvent)
     if (!found)
         return false;
 
-    if (sDeferredDeleteReports < sMaxDeferredDeleteReports) {
+    inEvent->accept();
+    // Asked again while it waits (the host called deleteLater() once more): no second report.
+    if (PostponedDeletion* waiting = findPostponed(inReceiver)) {
+        waiting->level = std::min(waiting->level, waitLevel);
+        return true;
+    }
+    if (sDeferredDeleteReports < kMaxDeferredDeleteReports) {
         // Pointers are written as 0x and hex digits; glibc's %p would add its own 0x.
         getTheLogInstance().tracef(
             RkLogFatal, "DeferredDelete",
@@ -203,9 +252,7 @@ Q_NEVER_INLINE bool deferredDeleteMustWait(QObject* inReceiver, QEvent* inEvent)
             foundLevel);
         ++sDeferredDeleteReports;
     }
-    inEvent->accept();
-    DeleteLaterFlag::clear(inReceiver);
-    inReceiver->deleteLater();
+    postpone(inReceiver, waitLevel);
     return true;
 }
 
@@ -336,7 +383,10 @@ ZuApplication::ZuApplication(int& argc, char** argv, char** envp)
     QGuiApplication::setDesktopSettingsAware(false);
 }
 
-ZuApplication::~ZuApplication() = default;
+ZuApplication::~ZuApplication()
+{
+    delete mSplashScreen.data();
+}
 
 bool ZuApplication::isMainThread()
 {
@@ -424,9 +474,10 @@ void ZuApplication::setDefaultParentProvider(DefaultParentProvider* inProvider)
 
 void ZuApplication::setSplashScreen(QSplashScreen* inSplash)
 {
-    if (inSplash == mSplashScreen.get())
+    if (inSplash == mSplashScreen)
         return;
-    mSplashScreen.reset(inSplash);
+    delete mSplashScreen.data();
+    mSplashScreen = inSplash;
     if (inSplash) {
         inSplash->show();
         QCoreApplication::processEvents();
@@ -499,29 +550,18 @@ void ZuApplication::handleFileOpenEvent(const QString& inFile, const QUrl& inUrl
     Q_EMIT protocolHandlerCalled();
 }
 
-// X11 last: its headers define macros (None, Bool, Status ...) that clash with Qt's.
-#include <X11/Xlib.h>
-
 Qt::MouseButtons ZuApplication::mouseButtons2()
 {
-    if (QX11Info::isPlatformX11()) {
-        if (Display* display = QX11Info::display()) {
-            Window root = 0;
-            Window child = 0;
-            int rootX = 0, rootY = 0, windowX = 0, windowY = 0;
-            unsigned int mask = 0;
-            if (XQueryPointer(display, DefaultRootWindow(display), &root, &child, &rootX, &rootY,
-                              &windowX, &windowY, &mask)) {
-                Qt::MouseButtons buttons;
-                if (mask & Button1Mask)
-                    buttons |= Qt::LeftButton;
-                if (mask & Button3Mask)
-                    buttons |= Qt::RightButton;
-                if (mask & Button2Mask)
-                    buttons |= Qt::MiddleButton;
-                return buttons;
-            }
-        }
+    unsigned buttons = 0;
+    if (QX11Info::isPlatformX11() && ZuPlatform::inputMouseButtons(QX11Info::display(), buttons)) {
+        Qt::MouseButtons result;
+        if (buttons & ZuPlatform::kMouseLeft)
+            result |= Qt::LeftButton;
+        if (buttons & ZuPlatform::kMouseRight)
+            result |= Qt::RightButton;
+        if (buttons & ZuPlatform::kMouseMiddle)
+            result |= Qt::MiddleButton;
+        return result;
     }
     // No window system to ask: the state Qt saw last is the closest we have.
     return QGuiApplication::mouseButtons();

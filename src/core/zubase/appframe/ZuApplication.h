@@ -6,6 +6,7 @@
 #include <QApplication>
 #include <QCursor>
 #include <QHash>
+#include <QPointer>
 #include <QString>
 
 #include <memory>
@@ -78,8 +79,8 @@ public:
     // Takes ownership; the previous provider is deleted (not when it is handed in again).
     void setDefaultParentProvider(DefaultParentProvider* inProvider);
 
-    // Takes ownership, deleting the previous splash screen; a new one is shown and painted
-    // at once. Null closes the current one.
+    // Takes ownership, deleting the previous splash screen (unless the host has deleted it
+    // already); a new one is shown and painted at once. Null closes the current one.
     void setSplashScreen(QSplashScreen* inSplash);
 
     // Routes the about action to inMember (a SLOT() string) of inReceiver, dropping earlier
@@ -117,7 +118,8 @@ private:
     bool n_______________________________________(QObject* inReceiver, QEvent* inEvent);
 
     std::unique_ptr<DefaultParentProvider> mDefaultParentProvider;
-    std::unique_ptr<QSplashScreen> mSplashScreen;
+    // Guarded: the host may delete its splash screen itself.
+    QPointer<QSplashScreen> mSplashScreen;
     QAction mAboutAction;
     QHash<QString, QString> mEnvironment;
 };

@@ -7,7 +7,7 @@
 #include <QScreen>
 
 #include <algorithm>
-#include <cstdio>
+#include <cctype>
 #include <cstdlib>
 #include <sstream>
 #include <string>
@@ -30,6 +30,62 @@ std::vector<ZuDesktop::Internal::ScreenGeometry> windowSystemScreens()
     return screens;
 }
 
+// Monitor coordinates and sizes beyond this are no monitor; within it, sums of two stay in int.
+const long long kMaxCoordinate = 1 << 24;
+
+// Reads tokens the way sscanf reads "%dx%d%c%d%c%d", with 64-bit numbers so that no value is
+// cut down silently: %d skips blanks, takes an optional sign and at least one digit, %c any
+// character, "x" itself.
+class TokenScanner
+{
+public:
+    explicit TokenScanner(const char* inText) : mText(inText) {}
+
+    bool number(long long& outValue)
+    {
+        while (std::isspace(static_cast<unsigned char>(*mText)))
+            ++mText;
+        const char* start = mText;
+        const bool negative = *mText == '-';
+        if (*mText == '-' || *mText == '+')
+            ++mText;
+        if (!std::isdigit(static_cast<unsigned char>(*mText))) {
+            mText = start;
+            return false;
+        }
+        long long value = 0;
+        for (; std::isdigit(static_cast<unsigned char>(*mText)); ++mText) {
+            // Saturates: anything this long is out of range anyway.
+            if (value <= kMaxCoordinate)
+                value = value * 10 + (*mText - '0');
+        }
+        outValue = negative ? -value : value;
+        return true;
+    }
+    bool character(char& outChar)
+    {
+        if (!*mText)
+            return false;
+        outChar = *mText++;
+        return true;
+    }
+    bool literal(char inChar)
+    {
+        if (*mText != inChar)
+            return false;
+        ++mText;
+        return true;
+    }
+
+private:
+    const char* mText;
+};
+
+bool inRange(long long inValue, long long inMinimum)
+{
+    return inValue >= inMinimum && inValue <= kMaxCoordinate;
+}
+
 void appendFromEnvironment(std::vector<ZuDesktop::DisplayInfo>& ioDisplays, const char* inValue,
                            bool* outFromEnvironment)
 {
@@ -38,21 +94,33 @@ void appendFromEnvironment(std::vector<ZuDesktop::DisplayInfo>& ioDisplays, cons
     std::istringstream tokens(value);
     std::string token;
     while (tokens >> token) {
-        ZuDesktop::DisplayInfo d;
+        long long w = 0, h = 0, x = 0, y = 0;
         char signX = 0;
         char signY = 0;
-        if (std::sscanf(token.c_str(), "%dx%d%c%d%c%d", &d.w, &d.h, &signX, &d.x, &signY, &d.y) ==
-            6) {
+        TokenScanner full(token.c_str());
+        TokenScanner sizeOnly(token.c_str());
+        if (full.number(w) && full.literal('x') && full.number(h) && full.character(signX) &&
+            full.number(x) && full.character(signY) && full.number(y)) {
             if (signX == '-')
-                d.x = -d.x;
+                x = -x;
             if (signY == '-')
-                d.y = -d.y;
-        } else if (std::sscanf(token.c_str(), "%dx%d", &d.w, &d.h) == 2) {
-            d.x = ioDisplays.empty() ? 0 : ioDisplays.back().x + ioDisplays.back().w;
-            d.y = 0;
+                y = -y;
+        } else if (sizeOnly.number(w) && sizeOnly.literal('x') && sizeOnly.number(h)) {
+            x = ioDisplays.empty() ? 0 : (long long)ioDisplays.back().x + ioDisplays.back().w;
+            y = 0;
         } else {
             continue;
         }
+        // Out of range is skipped like a malformed token: no negative sizes, nothing that
+        // would overflow the int geometry.
+        if (!inRange(w, 0) || !inRange(h, 0) || !inRange(x, -kMaxCoordinate) ||
+            !inRange(y, -kMaxCoordinate))
+            continue;
+        ZuDesktop::DisplayInfo d;
+        d.x = int(x);
+        d.y = int(y);
+        d.w = int(w);
+        d.h = int(h);
         d.availableX = d.x;
         d.availableY = d.y;
         d.availableW = d.w;
@@ -88,7 +156,7 @@ void appendFromScreens(std::vector<ZuDesktop::DisplayInfo>& ioDisplays,
         d.availableH = availableHeight;
         d.isPrimary = i == 0;
         // One output stretched over two monitors: at least 2.5 : 1.
-        if (4 * width >= 10 * height) {
+        if (4 * qint64(width) >= 10 * qint64(height)) {
             d.span = true;
             d.w = width / 2;
             d.availableW = availableWidth / 2;
@@ -171,9 +239,11 @@ bool getRelCenteredDisplayPos(int inX, int inY, int inW, int inH, int& outCenter
     std::vector<DisplayInfo> displays;
     getDisplayInfo(displays, nullptr);
     for (const DisplayInfo& d : displays) {
-        if (d.x < inX && d.y < inY && inX + inW < d.x + d.w && inY + inH < d.y + d.h) {
-            outCenterX = d.x + d.w / 2;
-            outCenterY = d.y + d.h / 2;
+        // In 64 bits: neither the caller's rectangle nor a monitor may overflow the sums.
+        if (d.x < inX && d.y < inY && qint64(inX) + inW < qint64(d.x) + d.w &&
+            qint64(inY) + inH < qint64(d.y) + d.h) {
+            outCenterX = int(d.x + qint64(d.w) / 2);
+            outCenterY = int(d.y + qint64(d.h) / 2);
             return true;
         }
     }

@@ -1,5 +1,7 @@
 #include "zubase/ZuColorDialog.h"
 
+#include "zubase/dialogs/ZuTopLevelWidgetWrapper_p.h"
+
 ZuColorDialog::ZuColorDialog(QWidget* inParent) : ZuTopLevelWidgetWrapper<QColorDialog>(inParent) {}
 
 ZuColorDialog::~ZuColorDialog() = default;
@@ -7,11 +9,12 @@ ZuColorDialog::~ZuColorDialog() = default;
 QColor ZuColorDialog::getColor(const QColor& inInitial, QWidget* inParent, const QString& inTitle,
                                QColorDialog::ColorDialogOptions inOptions)
 {
-    ZuColorDialog dialog(inParent);
+    ZuDialogHolder<ZuColorDialog> dialog(new ZuColorDialog(inParent));
     // Passed on as QColorDialog::getColor() does (alpha channel, no native dialog ...).
-    dialog.setOptions(inOptions);
-    dialog.setCurrentColor(inInitial);
+    dialog->setOptions(inOptions);
+    dialog->setCurrentColor(inInitial);
     if (!inTitle.isEmpty())
-        dialog.setWindowTitle(inTitle);
-    return dialog.exec() == 1 ? dialog.selectedColor() : QColor();
+        dialog->setWindowTitle(inTitle);
+    const int result = dialog->exec();
+    return (result == 1 && dialog.alive()) ? dialog->selectedColor() : QColor();
 }

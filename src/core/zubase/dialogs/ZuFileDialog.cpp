@@ -1,6 +1,10 @@
 #include "zubase/ZuFileDialog.h"
 
+#include "zubase/dialogs/ZuTopLevelWidgetWrapper_p.h"
+
 #include "rklib/RkDbC.h"
+
+#include <QFileInfo>
 
 #include <clocale>
 
@@ -46,24 +50,45 @@ int ZuFileDialog::exec()
     return result;
 }
 
-namespace {
-
-// Runs one of QFileDialog's static functions with the probe on and the default parent.
-template <typename Function, typename... Args>
-auto runWithProbe(Function inFunction, QWidget* inParent, const Args&... inArgs)
+QStringList ZuFileDialog::run(QWidget* inParent, const QString& inCaption,
+                              const QString& inDirectory, const QString& inFilter,
+                              QString* ioSelectedFilter, QFileDialog::Options inOptions,
+                              QFileDialog::FileMode inMode, QFileDialog::AcceptMode inAcceptMode)
 {
     ProbeScope probe;
-    return inFunction(ZuTopLevelWidgetWrapperHelper::parentOrDefault(inParent), inArgs...);
+    // The start may name a file, existing or to be made, in an existing folder: the folder is
+    // shown and the file preselected, as QFileDialog's static functions do.
+    QString folder = inDirectory;
+    QString file;
+    const QFileInfo start(inDirectory);
+    if (!inDirectory.isEmpty() && !start.isDir() && start.absoluteDir().exists()) {
+        folder = start.absolutePath();
+        file = start.fileName();
+    }
+    // Held through its QFileDialog base: the base class is private to everyone else.
+    ZuDialogHolder<QFileDialog> dialog(
+        static_cast<QFileDialog*>(new ZuFileDialog(inParent, inCaption, folder, inFilter)));
+    dialog->setOptions(inOptions);
+    dialog->setFileMode(inMode);
+    dialog->setAcceptMode(inAcceptMode);
+    if (!file.isEmpty())
+        dialog->selectFile(file);
+    if (ioSelectedFilter && !ioSelectedFilter->isEmpty())
+        dialog->selectNameFilter(*ioSelectedFilter);
+    if (dialog->exec() != QDialog::Accepted || !dialog.alive())
+        return QStringList();
+    if (ioSelectedFilter)
+        *ioSelectedFilter = dialog->selectedNameFilter();
+    return dialog->selectedFiles();
 }
-
-} // namespace
 
 QString ZuFileDialog::getOpenFileName(QWidget* inParent, const QString& inCaption,
                                       const QString& inDirectory, const QString& inFilter,
                                       QString* outSelectedFilter, QFileDialog::Options inOptions)
 {
-    return runWithProbe(&QFileDialog::getOpenFileName, inParent, inCaption, inDirectory, inFilter,
-                        outSelectedFilter, inOptions);
+    return run(inParent, inCaption, inDirectory, inFilter, outSelectedFilter, inOptions,
+               QFileDialog::ExistingFile, QFileDialog::AcceptOpen)
+        .value(0);
 }
 
 QStringList ZuFileDialog::getOpenFileNames(QWidget* inParent, const QString& inCaption,
@@ -71,22 +96,24 @@ QStringList ZuFileDialog::getOpenFileNames(QWidget* inParent, const QString& inC
                                            QString* outSelectedFilter,
                                            QFileDialog::Options inOptions)
 {
-    return runWithProbe(&QFileDialog::getOpenFileNames, inParent, inCaption, inDirectory, inFilter,
-                        outSelectedFilter, inOptions);
+    return run(inParent, inCaption, inDirectory, inFilter, outSelectedFilter, inOptions,
+               QFileDialog::ExistingFiles, QFileDialog::AcceptOpen);
 }
 
 QString ZuFileDialog::getSaveFileName(QWidget* inParent, const QString& inCaption,
                                       const QString& inDirectory, const QString& inFilter,
                                       QString* outSelectedFilter, QFileDialog::Options inOptions)
 {
-    return runWithProbe(&QFileDialog::getSaveFileName, inParent, inCaption, inDirectory, inFilter,
-                        outSelectedFilter, inOptions);
+    return run(inParent, inCaption, inDirectory, inFilter, outSelectedFilter, inOptions,
+               QFileDialog::AnyFile, QFileDialog::AcceptSave)
+        .value(0);
 }
 
 QString ZuFileDialog::getExistingDirectory(QWidget* inParent, const QString& inCaption,
                                            const QString& inDirectory,
                                            QFileDialog::Options inOptions)
 {
-    return runWithProbe(&QFileDialog::getExistingDirectory, inParent, inCaption, inDirectory,
-                        inOptions);
+    return run(inParent, inCaption, inDirectory, QString(), nullptr, inOptions,
+               QFileDialog::Directory, QFileDialog::AcceptOpen)
+        .value(0);
 }

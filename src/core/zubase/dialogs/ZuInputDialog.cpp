@@ -1,6 +1,7 @@
 #include "zubase/ZuInputDialog.h"
 
 #include "zubase/ZuDialog.h"
+#include "zubase/dialogs/ZuTopLevelWidgetWrapper_p.h"
 
 #include <QDialogButtonBox>
 #include <QLabel>
@@ -8,10 +9,13 @@
 
 namespace {
 
-void setOk(bool* outOk, int inResult)
+// Runs the dialog; true when it was accepted and is still there to be read.
+template <class T> bool run(const ZuDialogHolder<T>& inDialog, bool* outOk)
 {
+    const bool accepted = inDialog->exec() != 0 && inDialog.alive();
     if (outOk)
-        *outOk = inResult != 0;
+        *outOk = accepted;
+    return accepted;
 }
 
 } // namespace
@@ -24,32 +28,28 @@ int ZuInputDialog::getInt(QWidget* inParent, const QString& inTitle, const QStri
                           int inValue, int inMinimum, int inMaximum, int inStep, bool* outOk,
                           Qt::WindowFlags inFlags)
 {
-    ZuInputDialog dialog(inParent);
-    dialog.setWindowFlags(dialog.windowFlags() | inFlags);
-    dialog.setWindowTitle(inTitle);
-    dialog.setLabelText(inLabel);
-    dialog.setIntRange(inMinimum, inMaximum);
-    dialog.setIntValue(inValue);
-    dialog.setIntStep(inStep);
-    const int result = dialog.exec();
-    setOk(outOk, result);
-    return result ? dialog.intValue() : inValue;
+    ZuDialogHolder<ZuInputDialog> dialog(new ZuInputDialog(inParent));
+    dialog->setWindowFlags(dialog->windowFlags() | inFlags);
+    dialog->setWindowTitle(inTitle);
+    dialog->setLabelText(inLabel);
+    dialog->setIntRange(inMinimum, inMaximum);
+    dialog->setIntValue(inValue);
+    dialog->setIntStep(inStep);
+    return run(dialog, outOk) ? dialog->intValue() : inValue;
 }
 
 double ZuInputDialog::getDouble(QWidget* inParent, const QString& inTitle, const QString& inLabel,
                                 double inValue, double inMinimum, double inMaximum, int inDecimals,
                                 bool* outOk, Qt::WindowFlags inFlags)
 {
-    ZuInputDialog dialog(inParent);
-    dialog.setWindowFlags(dialog.windowFlags() | inFlags);
-    dialog.setWindowTitle(inTitle);
-    dialog.setLabelText(inLabel);
-    dialog.setDoubleDecimals(inDecimals);
-    dialog.setDoubleRange(inMinimum, inMaximum);
-    dialog.setDoubleValue(inValue);
-    const int result = dialog.exec();
-    setOk(outOk, result);
-    return result ? dialog.doubleValue() : inValue;
+    ZuDialogHolder<ZuInputDialog> dialog(new ZuInputDialog(inParent));
+    dialog->setWindowFlags(dialog->windowFlags() | inFlags);
+    dialog->setWindowTitle(inTitle);
+    dialog->setLabelText(inLabel);
+    dialog->setDoubleDecimals(inDecimals);
+    dialog->setDoubleRange(inMinimum, inMaximum);
+    dialog->setDoubleValue(inValue);
+    return run(dialog, outOk) ? dialog->doubleValue() : inValue;
 }
 
 QString ZuInputDialog::getItem(QWidget* inParent, const QString& inTitle, const QString& inLabel,
@@ -58,33 +58,29 @@ QString ZuInputDialog::getItem(QWidget* inParent, const QString& inTitle, const 
 {
     const QString initial =
         (inCurrent >= 0 && inCurrent < inItems.size()) ? inItems.at(inCurrent) : QString();
-    ZuInputDialog dialog(inParent);
-    dialog.setWindowFlags(dialog.windowFlags() | inFlags);
-    dialog.setWindowTitle(inTitle);
-    dialog.setLabelText(inLabel);
-    dialog.setComboBoxItems(inItems);
-    dialog.setTextValue(initial);
-    dialog.setComboBoxEditable(inEditable);
-    dialog.setInputMethodHints(inHints);
-    const int result = dialog.exec();
-    setOk(outOk, result);
-    return result ? dialog.textValue() : initial;
+    ZuDialogHolder<ZuInputDialog> dialog(new ZuInputDialog(inParent));
+    dialog->setWindowFlags(dialog->windowFlags() | inFlags);
+    dialog->setWindowTitle(inTitle);
+    dialog->setLabelText(inLabel);
+    dialog->setComboBoxItems(inItems);
+    dialog->setTextValue(initial);
+    dialog->setComboBoxEditable(inEditable);
+    dialog->setInputMethodHints(inHints);
+    return run(dialog, outOk) ? dialog->textValue() : initial;
 }
 
 QString ZuInputDialog::getMultiLineText(QWidget* inParent, const QString& inTitle,
                                         const QString& inLabel, const QString& inText, bool* outOk,
                                         Qt::WindowFlags inFlags, Qt::InputMethodHints inHints)
 {
-    ZuInputDialog dialog(inParent);
-    dialog.setWindowFlags(dialog.windowFlags() | inFlags);
-    dialog.setOptions(QInputDialog::UsePlainTextEditForTextInput);
-    dialog.setWindowTitle(inTitle);
-    dialog.setLabelText(inLabel);
-    dialog.setTextValue(inText);
-    dialog.setInputMethodHints(inHints);
-    const int result = dialog.exec();
-    setOk(outOk, result);
-    return result ? dialog.textValue() : QString();
+    ZuDialogHolder<ZuInputDialog> dialog(new ZuInputDialog(inParent));
+    dialog->setWindowFlags(dialog->windowFlags() | inFlags);
+    dialog->setOptions(QInputDialog::UsePlainTextEditForTextInput);
+    dialog->setWindowTitle(inTitle);
+    dialog->setLabelText(inLabel);
+    dialog->setTextValue(inText);
+    dialog->setInputMethodHints(inHints);
+    return run(dialog, outOk) ? dialog->textValue() : QString();
 }
 
 QString ZuInputDialog::getText(QWidget* inParent, const QString& inTitle, const QString& inLabel,
@@ -92,17 +88,17 @@ QString ZuInputDialog::getText(QWidget* inParent, const QString& inTitle, const 
                                Qt::WindowFlags inFlags, Qt::InputMethodHints inHints,
                                const QValidator* inValidator)
 {
-    ZuDialog dialog(inParent);
-    dialog.setWindowFlags(dialog.windowFlags() | inFlags);
-    dialog.setWindowTitle(inTitle);
-    dialog.setInputMethodHints(inHints);
+    ZuDialogHolder<ZuDialog> dialog(new ZuDialog(inParent));
+    dialog->setWindowFlags(dialog->windowFlags() | inFlags);
+    dialog->setWindowTitle(inTitle);
+    dialog->setInputMethodHints(inHints);
 
-    auto* layout = new QVBoxLayout(&dialog);
+    auto* layout = new QVBoxLayout(dialog.get());
     layout->setSizeConstraint(QLayout::SetMinAndMaxSize);
-    auto* label = new QLabel(inLabel, &dialog);
+    auto* label = new QLabel(inLabel, dialog.get());
     label->setSizePolicy(QSizePolicy::Minimum, QSizePolicy::Fixed);
     layout->addWidget(label);
-    auto* edit = new QLineEdit(inText, &dialog);
+    auto* edit = new QLineEdit(inText, dialog.get());
     edit->setEchoMode(inMode);
     // The hints matter where the text is typed.
     edit->setInputMethodHints(inHints);
@@ -113,12 +109,10 @@ QString ZuInputDialog::getText(QWidget* inParent, const QString& inTitle, const 
     label->setBuddy(edit);
     layout->addWidget(edit);
     auto* buttons = new QDialogButtonBox(QDialogButtonBox::Ok | QDialogButtonBox::Cancel,
-                                         Qt::Horizontal, &dialog);
-    QObject::connect(buttons, &QDialogButtonBox::accepted, &dialog, &QDialog::accept);
-    QObject::connect(buttons, &QDialogButtonBox::rejected, &dialog, &QDialog::reject);
+                                         Qt::Horizontal, dialog.get());
+    QObject::connect(buttons, &QDialogButtonBox::accepted, dialog.get(), &QDialog::accept);
+    QObject::connect(buttons, &QDialogButtonBox::rejected, dialog.get(), &QDialog::reject);
     layout->addWidget(buttons);
 
-    const int result = dialog.exec();
-    setOk(outOk, result);
-    return result ? edit->text() : QString();
+    return run(dialog, outOk) ? edit->text() : QString();
 }

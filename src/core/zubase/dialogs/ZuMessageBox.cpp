@@ -1,26 +1,28 @@
 #include "zubase/ZuMessageBox.h"
 
 #include "zubase/ZuApplication.h"
+#include "zubase/dialogs/ZuTopLevelWidgetWrapper_p.h"
 
 #include <QCoreApplication>
 #include <QLabel>
 #include <QLayout>
 #include <QPushButton>
 #include <QScreen>
+#include <QSplashScreen>
 
 #include <algorithm>
 
 namespace {
 
-void setUpBox(ZuMessageBox& inBox, QMessageBox::Icon inIcon, const QString& inTitle,
+void setUpBox(ZuMessageBox* inBox, QMessageBox::Icon inIcon, const QString& inTitle,
               const QString& inText, QMessageBox::StandardButtons inButtons,
               QMessageBox::StandardButton inDefaultButton)
 {
-    inBox.setIcon(inIcon);
-    inBox.setWindowTitle(inTitle.isEmpty() ? QCoreApplication::applicationName() : inTitle);
-    inBox.setText(inText);
-    inBox.setStandardButtons(inButtons);
-    inBox.setDefaultButton(inDefaultButton);
+    inBox->setIcon(inIcon);
+    inBox->setWindowTitle(inTitle.isEmpty() ? QCoreApplication::applicationName() : inTitle);
+    inBox->setText(inText);
+    inBox->setStandardButtons(inButtons);
+    inBox->setDefaultButton(inDefaultButton);
 }
 
 QMessageBox::StandardButton showBox(QMessageBox::Icon inIcon, QWidget* inParent,
@@ -28,9 +30,11 @@ QMessageBox::StandardButton showBox(QMessageBox::Icon inIcon, QWidget* inParent,
                                     QMessageBox::StandardButtons inButtons,
                                     QMessageBox::StandardButton inDefaultButton)
 {
-    ZuMessageBox box(inParent);
-    setUpBox(box, inIcon, inTitle, inText, inButtons, inDefaultButton);
-    return QMessageBox::StandardButton(box.exec());
+    ZuDialogHolder<ZuMessageBox> box(new ZuMessageBox(inParent));
+    setUpBox(box.get(), inIcon, inTitle, inText, inButtons, inDefaultButton);
+    const int result = box->exec();
+    // Gone with its parent window while it ran: as if closed without an answer.
+    return box.alive() ? QMessageBox::StandardButton(result) : QMessageBox::NoButton;
 }
 
 } // namespace
@@ -75,8 +79,17 @@ void ZuMessageBox::setVisible(bool inVisible)
 
 int ZuMessageBox::exec()
 {
-    if (ZuApplication* app = ZuApplication::instance())
+    if (ZuApplication* app = ZuApplication::instance()) {
+        // A box below a splash screen (its parent, or the default parent during start-up) would
+        // be deleted with it; it moves off the splash first, as a window of its own.
+        for (QWidget* ancestor = parentWidget(); ancestor; ancestor = ancestor->parentWidget()) {
+            if (qobject_cast<QSplashScreen*>(ancestor)) {
+                setParent(ancestor->parentWidget(), windowFlags());
+                break;
+            }
+        }
         app->setSplashScreen(nullptr);
+    }
     ZuApplication::Busy arrow(false);
     return ZuTopLevelWidgetWrapper<QMessageBox>::exec();
 }
@@ -106,10 +119,10 @@ ZU_MESSAGEBOX_KIND(warning, QMessageBox::Warning)
 
 bool ZuMessageBox::overwrite(QWidget* inParent, const QString& inFileName)
 {
-    ZuMessageBox box(inParent);
-    setUpBox(box, QMessageBox::Information, QString(),
+    ZuDialogHolder<ZuMessageBox> box(new ZuMessageBox(inParent));
+    setUpBox(box.get(), QMessageBox::Information, QString(),
              QCoreApplication::translate("DvMessage", "%1 already exists.").arg(inFileName),
              QMessageBox::Ok | QMessageBox::Cancel, QMessageBox::Cancel);
-    box.button(QMessageBox::Ok)->setText(tr("Overwrite"));
-    return box.exec() == QMessageBox::Ok;
+    box->button(QMessageBox::Ok)->setText(tr("Overwrite"));
+    return box->exec() == QMessageBox::Ok && box.alive();
 }

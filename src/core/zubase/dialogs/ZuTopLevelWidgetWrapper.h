@@ -9,6 +9,7 @@
 #include <QInputDialog>
 #include <QMessageBox>
 #include <QPoint>
+#include <QPointer>
 #include <QProgressDialog>
 #include <QShowEvent>
 
@@ -35,7 +36,8 @@ ZUBASE_EXPORT void prepareShow(QWidget* inDialog);
 // Base of every dialog of the library: parented to the application's default parent when
 // the caller gives none, without the help button, with the application's icon, centred over
 // its parent when first shown, raised and activated when shown, and never deleted by its own
-// exec() (WA_DeleteOnClose is cleared first; the caller owns the dialog).
+// exec() (WA_DeleteOnClose is cleared first; the caller owns the dialog). exec() also returns
+// safely when the dialog is deleted while it runs, e.g. together with its parent window.
 template <class T> class ZuTopLevelWidgetWrapper : public T
 {
 public:
@@ -58,8 +60,9 @@ public:
         const bool showModal = this->testAttribute(Qt::WA_ShowModal);
         if (this->testAttribute(Qt::WA_DeleteOnClose))
             this->setAttribute(Qt::WA_DeleteOnClose, false);
+        const QPointer<QWidget> self(this);
         const int result = T::exec();
-        if (result < 0)
+        if (self.isNull() || result < 0)
             return result;
         if (this->isVisible()) {
             this->setAttribute(Qt::WA_ShowModal, true);

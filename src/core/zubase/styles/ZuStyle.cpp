@@ -230,17 +230,18 @@ QRect ZuStyle::subElementRect(SubElement inElement, const QStyleOption* inOption
 {
     QRect rect = QProxyStyle::subElementRect(inElement, inOption, inWidget);
     if (inElement == SE_TabBarTabText && hasTabButtons(inOption)) {
-        // Cleanlooks leaves room for its own, wider spacing; hand back the difference.
-        const int dh = baseStyle()->pixelMetric(PM_TabBarTabHSpace, inOption, inWidget) / 2 - 4;
-        const int dv = baseStyle()->pixelMetric(PM_TabBarTabVSpace, inOption, inWidget) / 2 - 2;
-        const auto* tab = qstyleoption_cast<const QStyleOptionTab*>(inOption);
-        const bool vertical =
-            tab->shape == QTabBar::RoundedWest || tab->shape == QTabBar::RoundedEast ||
-            tab->shape == QTabBar::TriangularWest || tab->shape == QTabBar::TriangularEast;
-        if (vertical)
-            rect.adjust(dv, -dh, -dv, dh);
-        else
-            rect.adjust(-dh, dv, dh, -dv);
+        // Cleanlooks lays the text out with its own, wider tab spacing; Fusion asks this style.
+        // The padding the base really used shows on a plain tab with a button on the right,
+        // whose text starts and ends one padding inside the tab.
+        QStyleOptionTab probe;
+        probe.rect = QRect(0, 0, 200, 40);
+        probe.rightButtonSize = QSize(1, 1);
+        const QRect used = baseStyle()->subElementRect(SE_TabBarTabText, &probe, inWidget);
+        const int dh = used.left() - pixelMetric(PM_TabBarTabHSpace, &probe, inWidget) / 2;
+        const int dv = used.bottom() - probe.rect.bottom() -
+                       pixelMetric(PM_TabBarTabVSpace, &probe, inWidget) / 2;
+        // Vertical tabs too: Qt gives their rectangle in the tab's rotated frame.
+        rect.adjust(-dh, dv, dh, -dv);
     }
     return rect;
 }

@@ -21,7 +21,7 @@ const struct
 {
     const char* id;
     QPalette::ColorRole role;
-} sFileRoles[] = {
+} kFileRoles[] = {
     {"WindowText", QPalette::WindowText},
     {"Button", QPalette::Button},
     {"Light", QPalette::Light},
@@ -42,7 +42,7 @@ const struct
 
 bool roleForId(const QString& inId, QPalette::ColorRole& outRole)
 {
-    for (const auto& entry : sFileRoles) {
+    for (const auto& entry : kFileRoles) {
         if (inId == QLatin1String(entry.id)) {
             outRole = entry.role;
             return true;
@@ -96,6 +96,21 @@ QPalette allRolesSet(QPalette inPalette)
 }
 
 } // namespace
+
+QStyle* ZuStyleFactoryPrivate::widgetStyle(ZuStyleFactory& ioFactory, const QString& inClassName)
+{
+    // "Native" and the native class name are one class, as are spellings in other case.
+    QString key = inClassName.toLower();
+    if (key == QLatin1String("native"))
+        key = nativeStyleClass.toLower();
+    QPointer<QStyle>& style = widgetStyles[key];
+    if (!style) {
+        style = ioFactory.createStyleFromClass(inClassName);
+        if (style)
+            style->setParent(&ioFactory);
+    }
+    return style;
+}
 
 ThemeChangeObserver::~ThemeChangeObserver() = default;
 
@@ -188,7 +203,7 @@ bool ZuStyleFactory::addStyle(const QString& inFileName)
     if (!inactive.isNull()) {
         applyGroup(inactive, QPalette::Inactive, scheme.palette);
     } else {
-        for (const auto& entry : sFileRoles) {
+        for (const auto& entry : kFileRoles) {
             scheme.palette.setBrush(
                 QPalette::Inactive, entry.role,
                 QBrush(scheme.palette.color(QPalette::Active, entry.role), Qt::SolidPattern));
@@ -272,11 +287,9 @@ bool ZuStyleFactory::setStyleForWidget(const QString& inSchemeName, QWidget* inW
     const auto scheme = d->schemes.constFind(inSchemeName);
     if (scheme == d->schemes.constEnd() || !inWidget)
         return false;
-    QStyle* style = createStyleFromClass(scheme->styleClass);
+    QStyle* style = d->widgetStyle(*this, scheme->styleClass);
     if (!style)
         return false;
-    // Widgets do not own their style; the factory keeps it for the rest of the process.
-    style->setParent(this);
     applyToTree(inWidget, style, allRolesSet(scheme->palette));
     return true;
 }
@@ -285,10 +298,9 @@ bool ZuStyleFactory::setNativeStyleForWidget(QWidget* inWidget)
 {
     if (!inWidget)
         return false;
-    QStyle* style = QStyleFactory::create(d->nativeStyleClass);
+    QStyle* style = d->widgetStyle(*this, d->nativeStyleClass);
     if (!style)
         return false;
-    style->setParent(this);
     applyToTree(inWidget, style, allRolesSet(d->nativePalette));
     return true;
 }

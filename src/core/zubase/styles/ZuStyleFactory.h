@@ -45,7 +45,8 @@ public:
     // Null for an unknown scheme, else a new style of the scheme's class.
     QStyle* createStyleFromName(const QString& inSchemeName);
     // Gives the widget and all its descendants the scheme's style and palette; false, changing
-    // nothing, for an unknown scheme or a style that cannot be created.
+    // nothing, for an unknown scheme or a style that cannot be created. All trees styled with
+    // one style class share one style object, which the factory keeps.
     bool setStyleForWidget(const QString& inSchemeName, QWidget* inWidget);
     // The same with the platform's own style and the palette the application started with.
     bool setNativeStyleForWidget(QWidget* inWidget);

@@ -8,7 +8,9 @@
 #include <QColor>
 #include <QMap>
 #include <QPalette>
+#include <QPointer>
 #include <QString>
+#include <QStyle>
 
 class QEvent;
 class QObject;
@@ -43,9 +45,14 @@ public:
     static ZuStyleFactory* createDetached() { return new ZuStyleFactory; }
     static void destroyDetached(ZuStyleFactory* inFactory) { delete inFactory; }
 
+    // The style that setStyleForWidget() / setNativeStyleForWidget() give widget trees of
+    // this class, made once and kept by the factory: widgets do not own their style.
+    QStyle* widgetStyle(ZuStyleFactory& ioFactory, const QString& inClassName);
+
     QMap<QString, ZuColorScheme> schemes;
     QString currentName;
     QPalette nativePalette;
     QString nativeStyleClass;
     ThemeChangeObserver themeChangeObserver;
+    QMap<QString, QPointer<QStyle>> widgetStyles; // by lower-case class name
 };
