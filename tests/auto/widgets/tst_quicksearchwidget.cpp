@@ -1,7 +1,5 @@
 // The quick search field: reports after a typing pause, at once on Clear and Escape.
-#include "ObjectCount.h"
-
-#include "zubase/ZuApplication.h"
+#include "WidgetTest.h"
 #include "zubase/ZuQuickSearchWidget.h"
 
 #include <QAccessible>
@@ -10,195 +8,97 @@
 #include <QElapsedTimer>
 #include <QLineEdit>
 #include <QPushButton>
-#include <QSignalSpy>
 #include <QVBoxLayout>
-#include <QtTest>
-
-namespace {
-
-QStringList reported(const QSignalSpy& inSpy)
-{
-    QStringList texts;
-    for (const QList<QVariant>& arguments : inSpy)
-        texts << arguments.at(0).toString();
-    return texts;
-}
-
-} // namespace
 
 class tst_QuickSearchWidget : public QObject
 {
     Q_OBJECT
-
 private slots:
-    void reportsAfterTypingPause();
-    void reportsEveryEditWithoutDelay_data();
-    void reportsEveryEditWithoutDelay();
-    void clearReportsAtOnce();
-    void programTextNotReported();
+    void reporting();
     void escape_data();
     void escape();
-    void forScreenReader();
-    void nothingOutlivesWidget();
 };
 
-void tst_QuickSearchWidget::reportsAfterTypingPause()
+void tst_QuickSearchWidget::reporting()
 {
-    ZuQuickSearchWidget search(nullptr);
-    QCOMPARE(search.searchDelay(), 400);
-    auto* edit = search.findChild<QLineEdit*>();
-    QSignalSpy spy(&search, &ZuQuickSearchWidget::searchStringChanged);
-
+    auto* search = new ZuQuickSearchWidget(nullptr);
+    auto* edit = search->findChild<QLineEdit*>();
+    auto* clear = search->findChild<QPushButton*>();
+    QStringList reported;
+    connect(search, &ZuQuickSearchWidget::searchStringChanged,
+            [&](const QString& inText) { reported << inText; });
+    QCOMPARE(search->searchDelay(), 400);
     QTest::keyClick(edit, Qt::Key_A);
     QTest::qWait(100);
     QTest::keyClicks(edit, QStringLiteral("bc"));
-    QElapsedTimer sinceLastKey;
-    sinceLastKey.start();
-    QCOMPARE(spy.count(), 0);
-    QTRY_COMPARE_WITH_TIMEOUT(spy.count(), 1, 10000);
-    // A coarse timer may run out up to 5 % early; load only makes it later.
-    QVERIFY2(sinceLastKey.elapsed() >= 380, qPrintable(QString::number(sinceLastKey.elapsed())));
-    QCOMPARE(reported(spy), QStringList({"abc"}));
-    QTest::qWait(500);
-    QCOMPARE(spy.count(), 1);
-}
+    QElapsedTimer quiet;
+    quiet.start();
+    QCOMPARE(reported, QStringList());
+    QTRY_COMPARE_WITH_TIMEOUT(reported, QStringList({"abc"}), 10000);
+    QVERIFY(quiet.elapsed() >= 380); // a coarse timer may be 5 % early; load only makes it late
 
-void tst_QuickSearchWidget::reportsEveryEditWithoutDelay_data()
-{
-    QTest::addColumn<int>("delay");
-    QTest::newRow("0") << 0;
-    QTest::newRow("negative") << -5;
-}
+    // Clear reports at once on the press; the report still waiting comes too.
+    QTest::keyClick(edit, Qt::Key_D);
+    QTest::mousePress(clear, Qt::LeftButton);
+    QCOMPARE(reported, QStringList({"abc", ""}));
+    QTest::mouseRelease(clear, Qt::LeftButton);
+    QTRY_COMPARE_WITH_TIMEOUT(reported, QStringList({"abc", "", ""}), 10000);
 
-void tst_QuickSearchWidget::reportsEveryEditWithoutDelay()
-{
-    QFETCH(int, delay);
-    ZuQuickSearchWidget search(nullptr);
-    search.setSearchDelay(delay);
-    auto* edit = search.findChild<QLineEdit*>();
-    QSignalSpy spy(&search, &ZuQuickSearchWidget::searchStringChanged);
+    // Without a delay every edit reports at once; text set by code is not reported.
+    search->setSearchDelay(0);
     QTest::keyClicks(edit, QStringLiteral("ct"));
     QTest::keyClick(edit, Qt::Key_Backspace);
-    QCOMPARE(reported(spy), QStringList({"c", "ct", "c"}));
-}
-
-void tst_QuickSearchWidget::clearReportsAtOnce()
-{
-    ZuQuickSearchWidget search(nullptr);
-    search.setSearchDelay(200);
-    auto* edit = search.findChild<QLineEdit*>();
-    auto* clear = search.findChild<QPushButton*>();
+    edit->setText(QStringLiteral("by code"));
+    QCOMPARE(reported.mid(3), QStringList({"c", "ct", "c"}));
+    QCOMPARE(QAccessible::queryAccessibleInterface(edit)->text(QAccessible::Name),
+             QStringLiteral("Search filter"));
+    QCOMPARE(edit->placeholderText(), QStringLiteral("Enter Search Filter"));
     QCOMPARE(clear->text(), QStringLiteral("Clear"));
-    QSignalSpy spy(&search, &ZuQuickSearchWidget::searchStringChanged);
 
-    // An empty field still reports, on the press already.
-    QTest::mousePress(clear, Qt::LeftButton);
-    QCOMPARE(reported(spy), QStringList({""}));
-    QTest::mouseRelease(clear, Qt::LeftButton);
-    QCOMPARE(spy.count(), 1);
-
-    // While a report waits: cleared and reported at once, the wait still runs out later.
-    QTest::keyClicks(edit, QStringLiteral("mr"));
-    QTest::mouseClick(clear, Qt::LeftButton);
-    QCOMPARE(edit->text(), QString());
-    QCOMPARE(reported(spy), QStringList({"", ""}));
-    QTRY_COMPARE_WITH_TIMEOUT(reported(spy), QStringList({"", "", ""}), 10000);
-}
-
-void tst_QuickSearchWidget::programTextNotReported()
-{
-    ZuQuickSearchWidget search(nullptr);
-    search.setSearchDelay(0);
-    QSignalSpy spy(&search, &ZuQuickSearchWidget::searchStringChanged);
-    search.findChild<QLineEdit*>()->setText(QStringLiteral("set by code"));
-    QTest::qWait(50);
-    QCOMPARE(spy.count(), 0);
+    search->setSearchDelay(100);
+    QTest::keyClick(edit, Qt::Key_X);
+    delete search; // while a report waits: its timer goes with it
+    QTest::qWait(200);
+    QCOMPARE(reported.size(), 6);
 }
 
 void tst_QuickSearchWidget::escape_data()
 {
+    QTest::addColumn<bool>("inDialog"); // else Escape is a shortcut of the window
     QTest::addColumn<QString>("text");
-    QTest::addColumn<bool>("windowGetsEscape");
-    QTest::newRow("filled field") << "ct" << false;
-    QTest::newRow("empty field") << "" << true;
+    QTest::newRow("dialog, filled field") << true << "ct";
+    QTest::newRow("dialog, empty field") << true << "";
+    QTest::newRow("window, filled field") << false << "ct";
+    QTest::newRow("window, empty field") << false << "";
 }
 
 void tst_QuickSearchWidget::escape()
 {
+    QFETCH(bool, inDialog);
     QFETCH(QString, text);
-    QFETCH(bool, windowGetsEscape);
-    for (const bool inDialog : {true, false}) {
-        // In a dialog Escape closes it; elsewhere it may be a window's shortcut.
-        std::unique_ptr<QWidget> window(inDialog ? new QDialog : new QWidget);
-        auto* search = new ZuQuickSearchWidget(window.get());
-        (new QVBoxLayout(window.get()))->addWidget(search);
-        QAction shortcut(window.get());
-        shortcut.setShortcut(Qt::Key_Escape);
-        if (!inDialog)
-            window->addAction(&shortcut);
-        int windowGot = 0;
-        if (inDialog)
-            connect(static_cast<QDialog*>(window.get()), &QDialog::rejected, [&] { ++windowGot; });
-        else
-            connect(&shortcut, &QAction::triggered, [&] { ++windowGot; });
-        window->show();
-        QVERIFY(QTest::qWaitForWindowActive(window.get()));
-        auto* edit = search->findChild<QLineEdit*>();
-        edit->setFocus();
-        QTest::keyClicks(edit, text);
-        QSignalSpy spy(search, &ZuQuickSearchWidget::searchStringChanged);
-
-        QTest::keyClick(edit, Qt::Key_Escape);
-        QCOMPARE(edit->text(), QString());
-        QCOMPARE(reported(spy), windowGetsEscape ? QStringList() : QStringList({""}));
-        QCOMPARE(windowGot, windowGetsEscape ? 1 : 0);
-        QCOMPARE(window->isVisible(), !(inDialog && windowGetsEscape));
-    }
+    std::unique_ptr<QWidget> window(inDialog ? new QDialog : new QWidget);
+    auto* search = new ZuQuickSearchWidget(window.get());
+    (new QVBoxLayout(window.get()))->addWidget(search);
+    QAction shortcut(window.get());
+    shortcut.setShortcut(Qt::Key_Escape);
+    QSignalSpy windowGot(&shortcut, &QAction::triggered);
+    if (!inDialog)
+        window->addAction(&shortcut);
+    else
+        connect(static_cast<QDialog*>(window.get()), &QDialog::rejected, &shortcut,
+                &QAction::trigger);
+    window->show();
+    QVERIFY(QTest::qWaitForWindowActive(window.get()));
+    auto* edit = search->findChild<QLineEdit*>();
+    edit->setFocus();
+    QTest::keyClicks(edit, text);
+    QSignalSpy reported(search, &ZuQuickSearchWidget::searchStringChanged);
+    QTest::keyClick(edit, Qt::Key_Escape);
+    // A filled field is emptied and reported at once; an empty one leaves Escape to the window.
+    QCOMPARE(edit->text(), QString());
+    QCOMPARE(reported.count(), text.isEmpty() ? 0 : 1);
+    QCOMPARE(windowGot.count(), text.isEmpty() ? 1 : 0);
 }
 
-void tst_QuickSearchWidget::forScreenReader()
-{
-    ZuQuickSearchWidget search(nullptr);
-    QAccessibleInterface* widget = QAccessible::queryAccessibleInterface(&search);
-    QVERIFY(widget);
-    QStringList parts;
-    for (int i = 0; i < widget->childCount(); ++i) {
-        QAccessibleInterface* child = widget->child(i);
-        parts << QStringLiteral("%1:%2").arg(child->role()).arg(child->text(QAccessible::Name));
-    }
-    QCOMPARE(parts, QStringList({QStringLiteral("%1:Search filter").arg(QAccessible::EditableText),
-                                 QStringLiteral("%1:Clear").arg(QAccessible::Button)}));
-    QCOMPARE(search.findChild<QLineEdit*>()->placeholderText(),
-             QStringLiteral("Enter Search Filter"));
-}
-
-void tst_QuickSearchWidget::nothingOutlivesWidget()
-{
-    int reports = 0;
-    auto typeAndDelete = [&reports] {
-        auto* search = new ZuQuickSearchWidget(nullptr);
-        connect(search, &ZuQuickSearchWidget::searchStringChanged, [&reports] { ++reports; });
-        QTest::keyClick(search->findChild<QLineEdit*>(), Qt::Key_X);
-        delete search; // while a report waits
-        QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
-    };
-    typeAndDelete(); // whatever Qt makes on first use is not counted
-    LiveObjects live;
-    typeAndDelete();
-    QCOMPARE(live.count(), 0);
-    QTest::qWait(500);
-    QCOMPARE(reports, 0);
-}
-
-int main(int argc, char** argv)
-{
-    ZuApplication* application = ZuApplication::createInstance(argc, argv, nullptr);
-    if (!application)
-        return 1;
-    tst_QuickSearchWidget test;
-    const int result = QTest::qExec(&test, argc, argv);
-    delete application;
-    return result;
-}
-
+ZU_WIDGET_TEST_MAIN(tst_QuickSearchWidget)
 #include "tst_quicksearchwidget.moc"
