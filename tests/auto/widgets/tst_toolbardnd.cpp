@@ -1,0 +1,206 @@
+// Reordering a tool bar's buttons by dragging them, and putting a stored order back. Offscreen
+// windows take no drops (a drag ends at once), so the drags run on the Xvfb only.
+#include "TestSupport.h"
+#include "WidgetTest.h"
+#include "zubase/ZuToolBarDnD.h"
+
+#include <QDrag>
+#include <QToolButton>
+
+static QString order(const QToolBar* inBar)
+{
+    QString names;
+    for (const QAction* action : inBar->actions())
+        names += action->text();
+    return names;
+}
+
+static QToolButton* button(QToolBar* inBar, const QString& inText)
+{
+    for (QAction* action : inBar->actions()) {
+        if (action->text() == inText)
+            return qobject_cast<QToolButton*>(inBar->widgetForAction(action));
+    }
+    return nullptr;
+}
+
+static void sendMouse(QWidget* inTo, QEvent::Type inType, const QPoint& inPos,
+                      Qt::MouseButtons inButtons)
+{
+    const Qt::MouseButton button = inType == QEvent::MouseMove   ? Qt::NoButton
+                                   : inButtons & Qt::RightButton ? Qt::RightButton
+                                                                 : Qt::LeftButton;
+    QMouseEvent event(inType, inPos, inTo->mapToGlobal(inPos), button,
+                      inType == QEvent::MouseButtonRelease ? Qt::NoButton : inButtons, {});
+    QApplication::sendEvent(inTo, &event);
+}
+
+// Presses inSource and moves it by inMove with inButtons held; if that starts a drag, moves the
+// pointer to inTarget (global) and drops there. Returns whether a drag started.
+static bool drag(QToolButton* inSource, const QPoint& inMove, const QPoint& inTarget,
+                 Qt::MouseButtons inButtons = Qt::LeftButton)
+{
+    const QPoint start = inSource->rect().center();
+    QCursor::setPos(inSource->mapToGlobal(start));
+    sendMouse(inSource, QEvent::MouseButtonPress, start, inButtons);
+    QWidget* window = inSource->window();
+    bool started = false;
+    QTimer::singleShot(0, window, [&] {
+        if (!(started = window->findChild<QDrag*>()))
+            return;
+        QCursor::setPos(inTarget);
+        sendMouse(window, QEvent::MouseMove, window->mapFromGlobal(inTarget), inButtons);
+        sendMouse(window, QEvent::MouseButtonRelease, window->mapFromGlobal(inTarget), inButtons);
+    });
+    QPointer<QToolButton> source = inSource; // rebuilt by a drop
+    sendMouse(inSource, QEvent::MouseMove, start + inMove, inButtons);
+    QCoreApplication::processEvents(); // runs the timer if no drag did
+    if (source)
+        sendMouse(source, QEvent::MouseButtonRelease, start + inMove, inButtons);
+    return started;
+}
+
+class tst_ToolBarDnD : public QObject
+{
+    Q_OBJECT
+private slots:
+    void init();
+    void cleanup() { delete mWindow; }
+    void dropReorders_data();
+    void dropReorders();
+    void dragStarts_data();
+    void dragStarts();
+    void changeActionOrder();
+
+private:
+    QWidget* mWindow = nullptr;
+    ZuToolBarDnD* mBar = nullptr;
+};
+
+void tst_ToolBarDnD::init()
+{
+    mWindow = new QWidget;
+    mWindow->resize(400, 300);
+    mBar = new ZuToolBarDnD(mWindow);
+    mBar->setIconSize(QSize(40, 40)); // room for a move of twice the drag distance
+    QPixmap icon(40, 40);
+    icon.fill(Qt::darkCyan);
+    for (const char* text : {"A", "B", "C", "D"})
+        mBar->addAction(icon, QLatin1String(text));
+    mBar->resize(mBar->sizeHint());
+    mBar->setDragAndDropEnabled(true);
+    mWindow->show();
+    QVERIFY(QTest::qWaitForWindowExposed(mWindow));
+    if (QGuiApplication::platformName() == QLatin1String("offscreen") &&
+        QByteArray(QTest::currentTestFunction()).startsWith("d"))
+        QSKIP("drags need a window system; the Xvfb run covers them");
+}
+
+void tst_ToolBarDnD::dropReorders_data()
+{
+    QTest::addColumn<QString>("spot"); // dragged button, target button, half (l r u d)
+    QTest::addColumn<QString>("expected");
+    QTest::addColumn<int>("emitted");
+    auto row = [](const char* inName, const char* inSpot, const char* inExpected, int inEmitted) {
+        QTest::newRow(inName) << QString(inSpot) << QString(inExpected) << inEmitted;
+    };
+    row("A onto D's right half", "ADr", "BCDA", 1);
+    row("A onto C's left half", "ACl", "BACD", 1);
+    row("D onto B's right half", "DBr", "ABDC", 1);
+    row("A onto its own left half", "AAl", "ABCD", 0);
+    row("B onto A's right half", "BAr", "ABCD", 0);
+    row("A onto B's left half, rebuilt", "ABl", "ABCD", 1);
+    row("vertical, C onto B's upper half", "CBu", "ACBD", 1);
+    row("vertical, A onto D's lower half", "ADd", "BCDA", 1);
+    // Where B's button, hidden, still is (left of C's middle) is no destination.
+    row("B hidden, D onto C's left half", "DCl", "ABDC", 1);
+}
+
+void tst_ToolBarDnD::dropReorders()
+{
+    QFETCH(QString, spot);
+    QFETCH(QString, expected);
+    QFETCH(int, emitted);
+    if (QByteArray(QTest::currentDataTag()).startsWith("vertical")) {
+        mBar->setOrientation(Qt::Vertical);
+        mBar->resize(mBar->sizeHint());
+        QTRY_VERIFY(button(mBar, "D")->y() > button(mBar, "C")->y());
+    }
+    if (QByteArray(QTest::currentDataTag()).startsWith("B hidden")) {
+        const int whereBWas = button(mBar, "B")->x();
+        mBar->actions().at(1)->setVisible(false);
+        QTRY_COMPARE(button(mBar, "C")->x(), whereBWas);
+    }
+    RkLogCapture log;
+    QSignalSpy spy(mBar, &ZuToolBarDnD::toolButtonOrderChanged);
+    QPointer<QToolButton> first = button(mBar, "A");
+    QToolButton* target = button(mBar, spot.mid(1, 1));
+    const QPoint at = spot[2] == 'l' || spot[2] == 'u'
+                          ? QPoint(2, 2)
+                          : target->rect().bottomRight() - QPoint(2, 2);
+    QVERIFY(drag(button(mBar, spot.left(1)), QPoint(QApplication::startDragDistance(), 0),
+                 target->mapToGlobal(at)));
+    QCOMPARE(order(mBar), expected);
+    QCOMPARE(spy.count(), emitted);
+    // A rebuild makes new buttons; the old go once the drag is over, none while still busy.
+    QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
+    QCOMPARE(first.isNull(), emitted > 0);
+    QCOMPARE(TestSupport::logLines(log, "DeferredDelete"), QStringList());
+}
+
+void tst_ToolBarDnD::dragStarts_data()
+{
+    QTest::addColumn<QPoint>("move");
+    QTest::addColumn<int>("buttons");
+    QTest::addColumn<bool>("enabled");
+    QTest::addColumn<bool>("started");
+    const int distance = QApplication::startDragDistance();
+    QTest::newRow("exactly the distance") << QPoint(distance - 3, 3) << 1 << true << true;
+    QTest::newRow("one short") << QPoint(3 - distance, 2) << 1 << true << false;
+    QTest::newRow("right button") << QPoint(distance * 2, 0) << 2 << true << false;
+    QTest::newRow("disabled") << QPoint(distance * 2, 0) << 1 << false << false;
+}
+
+void tst_ToolBarDnD::dragStarts()
+{
+    QFETCH(QPoint, move);
+    QFETCH(int, buttons);
+    QFETCH(bool, enabled);
+    QFETCH(bool, started);
+    mBar->setDragAndDropEnabled(enabled);
+    QSignalSpy clicked(button(mBar, "A"), &QToolButton::clicked);
+    QCOMPARE(drag(button(mBar, "A"), move, button(mBar, "D")->mapToGlobal(QPoint(40, 5)),
+                  Qt::MouseButtons(buttons)),
+             started);
+    QCOMPARE(order(mBar), QLatin1String(started ? "BCDA" : "ABCD"));
+    // Without a drag it is any tool bar's button.
+    QCOMPARE(clicked.count(), !started && buttons == Qt::LeftButton ? 1 : 0);
+}
+
+void tst_ToolBarDnD::changeActionOrder()
+{
+    QAction stranger(QStringLiteral("X"));
+    const QList<QAction*> own = mBar->actions();
+    QSignalSpy spy(mBar, &ZuToolBarDnD::toolButtonOrderChanged);
+    for (const QList<QAction*>& wrong :
+         {own.mid(1), own.mid(0, 3) << &stranger, own.mid(0, 3) << own.at(0), QList<QAction*>()}) {
+        mBar->changeActionOrder(wrong);
+        QCOMPARE(order(mBar), QStringLiteral("ABCD"));
+    }
+    QCOMPARE(spy.count(), 0);
+    mBar->changeActionOrder(own);
+    mBar->changeActionOrder({own.at(3), own.at(2), own.at(1), own.at(0)});
+    QCOMPARE(order(mBar), QStringLiteral("DCBA"));
+    QCOMPARE(spy.count(), 2); // also for an unchanged order
+    if (QGuiApplication::platformName() != QLatin1String("offscreen")) // new buttons, watched
+        QVERIFY(drag(button(mBar, "D"), QPoint(20, 0), button(mBar, "A")->mapToGlobal({40, 5})));
+
+    QAction a, b;
+    QVERIFY(ZuToolBarDnD::compareActionsOrderIndepend({}, {}));
+    QVERIFY(ZuToolBarDnD::compareActionsOrderIndepend({&a, &b, &a}, {&a, &a, &b}));
+    QVERIFY(!ZuToolBarDnD::compareActionsOrderIndepend({&a, &a, &b}, {&a, &b, &b}));
+    QVERIFY(!ZuToolBarDnD::compareActionsOrderIndepend({&a, &b}, {&a, &b, &b}));
+}
+
+ZU_WIDGET_TEST_MAIN(tst_ToolBarDnD)
+#include "tst_toolbardnd.moc"
