@@ -6,6 +6,7 @@
 // Widgets I
 
 // Widgets II
+#include "DemoWidgetsFieldsPage.h"
 
 // Widgets III
 
@@ -52,6 +53,7 @@ const std::vector<DemoPage>& demoPages()
         // Widgets I
 
         // Widgets II
+        {"widgets-fields", "Fields and buttons", &make<DemoWidgetsFieldsPage>},
 
         // Widgets III
 
