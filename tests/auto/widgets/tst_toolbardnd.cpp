@@ -73,8 +73,6 @@ private slots:
     void cleanup() { delete mWindow; }
     void dropReorders_data();
     void dropReorders();
-    void dragStarts_data();
-    void dragStarts();
     void changeActionOrder();
 
 private:
@@ -107,8 +105,13 @@ void tst_ToolBarDnD::dropReorders_data()
     QTest::addColumn<QString>("spot"); // dragged button, target button, half (l r u d)
     QTest::addColumn<QString>("expected");
     QTest::addColumn<int>("emitted");
-    auto row = [](const char* inName, const char* inSpot, const char* inExpected, int inEmitted) {
-        QTest::newRow(inName) << QString(inSpot) << QString(inExpected) << inEmitted;
+    QTest::addColumn<QPoint>("move"); // what starts the drag
+    QTest::addColumn<int>("buttons");
+    const int distance = QApplication::startDragDistance();
+    auto row = [distance](const char* inName, const char* inSpot, const char* inExpected,
+                          int inEmitted, QPoint inMove = {}, int inButtons = Qt::LeftButton) {
+        QTest::newRow(inName) << QString(inSpot) << QString(inExpected) << inEmitted
+                              << (inMove.isNull() ? QPoint(distance, 0) : inMove) << inButtons;
     };
     row("A onto D's right half", "ADr", "BCDA", 1);
     row("A onto C's left half", "ACl", "BACD", 1);
@@ -120,6 +123,10 @@ void tst_ToolBarDnD::dropReorders_data()
     row("vertical, A onto D's lower half", "ADd", "BCDA", 1);
     // Where B's button, hidden, still is (left of C's middle) is no destination.
     row("B hidden, D onto C's left half", "DCl", "ABDC", 1);
+    row("moved just the drag distance", "ADr", "BCDA", 1, QPoint(distance - 3, 3));
+    row("no drag: one short of the distance", "ADr", "ABCD", 0, QPoint(3 - distance, 2));
+    row("no drag: right button", "ADr", "ABCD", 0, QPoint(distance, 0), Qt::RightButton);
+    row("no drag: disabled", "ADr", "ABCD", 0);
 }
 
 void tst_ToolBarDnD::dropReorders()
@@ -127,12 +134,16 @@ void tst_ToolBarDnD::dropReorders()
     QFETCH(QString, spot);
     QFETCH(QString, expected);
     QFETCH(int, emitted);
-    if (QByteArray(QTest::currentDataTag()).startsWith("vertical")) {
+    QFETCH(QPoint, move);
+    QFETCH(int, buttons);
+    const QByteArray tag = QTest::currentDataTag();
+    mBar->setDragAndDropEnabled(!tag.endsWith("disabled"));
+    if (tag.startsWith("vertical")) {
         mBar->setOrientation(Qt::Vertical);
         mBar->resize(mBar->sizeHint());
         QTRY_VERIFY(button(mBar, "D")->y() > button(mBar, "C")->y());
     }
-    if (QByteArray(QTest::currentDataTag()).startsWith("B hidden")) {
+    if (tag.startsWith("B hidden")) {
         const int whereBWas = button(mBar, "B")->x();
         mBar->actions().at(1)->setVisible(false);
         QTRY_COMPARE(button(mBar, "C")->x(), whereBWas);
@@ -144,43 +155,15 @@ void tst_ToolBarDnD::dropReorders()
     const QPoint at = spot[2] == 'l' || spot[2] == 'u'
                           ? QPoint(2, 2)
                           : target->rect().bottomRight() - QPoint(2, 2);
-    QVERIFY(drag(button(mBar, spot.left(1)), QPoint(QApplication::startDragDistance(), 0),
-                 target->mapToGlobal(at)));
+    QCOMPARE(
+        drag(button(mBar, spot.left(1)), move, target->mapToGlobal(at), Qt::MouseButtons(buttons)),
+        !tag.startsWith("no drag"));
     QCOMPARE(order(mBar), expected);
     QCOMPARE(spy.count(), emitted);
     // A rebuild makes new buttons; the old go once the drag is over, none while still busy.
     QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
     QCOMPARE(first.isNull(), emitted > 0);
     QCOMPARE(TestSupport::logLines(log, "DeferredDelete"), QStringList());
-}
-
-void tst_ToolBarDnD::dragStarts_data()
-{
-    QTest::addColumn<QPoint>("move");
-    QTest::addColumn<int>("buttons");
-    QTest::addColumn<bool>("enabled");
-    QTest::addColumn<bool>("started");
-    const int distance = QApplication::startDragDistance();
-    QTest::newRow("exactly the distance") << QPoint(distance - 3, 3) << 1 << true << true;
-    QTest::newRow("one short") << QPoint(3 - distance, 2) << 1 << true << false;
-    QTest::newRow("right button") << QPoint(distance * 2, 0) << 2 << true << false;
-    QTest::newRow("disabled") << QPoint(distance * 2, 0) << 1 << false << false;
-}
-
-void tst_ToolBarDnD::dragStarts()
-{
-    QFETCH(QPoint, move);
-    QFETCH(int, buttons);
-    QFETCH(bool, enabled);
-    QFETCH(bool, started);
-    mBar->setDragAndDropEnabled(enabled);
-    QSignalSpy clicked(button(mBar, "A"), &QToolButton::clicked);
-    QCOMPARE(drag(button(mBar, "A"), move, button(mBar, "D")->mapToGlobal(QPoint(40, 5)),
-                  Qt::MouseButtons(buttons)),
-             started);
-    QCOMPARE(order(mBar), QLatin1String(started ? "BCDA" : "ABCD"));
-    // Without a drag it is any tool bar's button.
-    QCOMPARE(clicked.count(), !started && buttons == Qt::LeftButton ? 1 : 0);
 }
 
 void tst_ToolBarDnD::changeActionOrder()

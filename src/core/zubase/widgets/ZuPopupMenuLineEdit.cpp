@@ -1,5 +1,6 @@
 #include "zubase/ZuPopupMenuLineEdit.h"
 
+#include "zubase/ZuStyle.h"
 #include "zubase/ZuStyleFactory.h"
 
 #include <QKeyEvent>
@@ -78,9 +79,9 @@ void ZuPopupMenuLineEdit::skinify(QToolButton* inButton)
 {
     if (!inButton)
         return;
-    // A style the button already owns is kept: a second call must not pile up styles.
+    // A style of ours the button already owns is kept: calls must not pile up styles.
     QStyle* current = inButton->style();
-    if (current->parent() != inButton) {
+    if (current->parent() != inButton || !dynamic_cast<ZuStyle*>(current)) {
         QStyle* style = ZuStyleFactory::instance().createStyleFromClass(QStringLiteral("ZuStyle"));
         style->setParent(inButton); // widgets do not own their style
         inButton->setStyle(style);
