@@ -7,6 +7,7 @@
 #include "DemoWidgetsPanelsPage.h"
 
 // Widgets II
+#include "DemoWidgetsFieldsPage.h"
 
 // Widgets III
 
@@ -54,6 +55,7 @@ const std::vector<DemoPage>& demoPages()
         {"widgets-panels", "Panels", &make<DemoWidgetsPanelsPage>},
 
         // Widgets II
+        {"widgets-fields", "Fields and buttons", &make<DemoWidgetsFieldsPage>},
 
         // Widgets III
 
