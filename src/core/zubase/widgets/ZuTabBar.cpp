@@ -51,15 +51,13 @@ void ZuTabBar::mousePressEvent(QMouseEvent* inEvent)
     inEvent->accept();
 }
 
-void ZuTabBar::tabInserted(int inIndex)
+void ZuTabBar::tabInserted(int)
 {
-    QTabBar::tabInserted(inIndex);
-    tabLayoutChange();
+    tabLayoutChange(); // a hidden bar lays its tabs out only when shown
 }
 
 void ZuTabBar::tabLayoutChange()
 {
-    QTabBar::tabLayoutChange();
     // Only names this bar gave are taken back: a host may name its tabs itself.
     const QString name = tr("New tab");
     for (int index = 0; index < count(); ++index) {

@@ -1,0 +1,260 @@
+// ZuDirectionalLabel and ZuPixmapWidget rendered into images, at pixel ratios 1 and 2.
+#include "zubase/ZuDirectionalLabel.h"
+#include "zubase/ZuPixmapWidget.h"
+
+#include <QAccessible>
+#include <QtTest>
+
+#include <private/qhighdpiscaling_p.h>
+
+#include <functional>
+#include <memory>
+
+namespace {
+
+using Widget = std::unique_ptr<QWidget>;
+
+QImage grabbed(QWidget& inWidget)
+{
+    return inWidget.grab().toImage().convertToFormat(QImage::Format_RGB32);
+}
+
+// Bounding box of the pixels for which inTest holds.
+QRect boxOf(const QImage& inImage, const std::function<bool(QRgb)>& inTest)
+{
+    QRect box;
+    for (int y = 0; y < inImage.height(); ++y)
+        for (int x = 0; x < inImage.width(); ++x)
+            if (inTest(inImage.pixel(x, y)))
+                box |= QRect(x, y, 1, 1);
+    return box;
+}
+
+QRect inkOf(const QImage& inImage)
+{
+    return boxOf(inImage, [](QRgb inPixel) { return qGray(inPixel) < 100; });
+}
+
+ZuDirectionalLabel* label(int inDirection, const QSize& inSize = {30, 120})
+{
+    auto* label = new ZuDirectionalLabel;
+    label->setText("Caption");
+    label->setPalette(
+        QPalette(Qt::black, Qt::white, Qt::white, Qt::black, Qt::gray, Qt::black, Qt::white));
+    label->setAlignment(Qt::AlignLeft | Qt::AlignTop);
+    label->setDirection(ZuDirectionalLabel::Direction(inDirection));
+    label->resize(inSize);
+    return label;
+}
+
+ZuPixmapWidget* checkered()
+{
+    auto* widget = new ZuPixmapWidget;
+    QImage checkers(200, 200, QImage::Format_RGB32);
+    for (int y = 0; y < 200; ++y)
+        for (int x = 0; x < 200; ++x)
+            checkers.setPixel(x, y, (x + y) % 2 ? qRgb(255, 0, 0) : qRgb(0, 0, 255));
+    widget->setPixmap(QPixmap::fromImage(checkers));
+    widget->setOverlayText("CT 12", Qt::AlignBottom | Qt::AlignRight);
+    widget->resize(100, 100);
+    return widget;
+}
+
+// A new widget on a screen of the given pixel ratio, grabbed at that ratio.
+QImage grabAtRatio(qreal inRatio, const std::function<QWidget*()>& inMake)
+{
+    QHighDpiScaling::setGlobalFactor(inRatio);
+    Widget widget(inMake());
+    widget->show();
+    const QImage image = QTest::qWaitForWindowExposed(widget.get()) ? grabbed(*widget) : QImage();
+    widget.reset();
+    QHighDpiScaling::setGlobalFactor(1);
+    return image;
+}
+
+} // namespace
+
+class TstLabels : public QObject
+{
+    Q_OBJECT
+
+private Q_SLOTS:
+    // The label looks like a plain label turned; hints are turned, the name stays the text.
+    void directions_data()
+    {
+        QTest::addColumn<int>("direction");
+        for (int direction = 0; direction < 4; ++direction)
+            QTest::addRow("%d", direction) << direction;
+    }
+    void directions()
+    {
+        QFETCH(int, direction);
+        Widget plain(label(0, {120, 30}));
+        Widget turned(label(direction, direction < 2 ? QSize(120, 30) : QSize(30, 120)));
+        const QRect ink = inkOf(grabbed(*plain));
+        const int x = ink.x(), y = ink.y(), w = ink.width(), h = ink.height();
+        const QRect expected[] = {ink, QRect(120 - x - w, 30 - y - h, w, h),
+                                  QRect(30 - y - h, x, h, w), QRect(y, 120 - x - w, h, w)};
+        const QRect seen = inkOf(grabbed(*turned));
+        QVERIFY2((seen.topLeft() - expected[direction].topLeft()).manhattanLength() <= 1 &&
+                     (seen.bottomRight() - expected[direction].bottomRight()).manhattanLength() <=
+                         1,
+                 qPrintable(QString("%1,%2 %3x%4")
+                                .arg(seen.x())
+                                .arg(seen.y())
+                                .arg(seen.width())
+                                .arg(seen.height())));
+        const bool vertical = direction >= 2;
+        QCOMPARE(turned->sizeHint(), vertical ? plain->sizeHint().transposed() : plain->sizeHint());
+        QCOMPARE(turned->minimumSizeHint(),
+                 vertical ? plain->minimumSizeHint().transposed() : plain->minimumSizeHint());
+        QCOMPARE(QAccessible::queryAccessibleInterface(turned.get())->text(QAccessible::Name),
+                 "Caption");
+    }
+
+    // After a change the label shows what a new label in that state shows.
+    void cacheFollowsChanges_data()
+    {
+        QTest::addColumn<QString>("change");
+        for (const char* change : {"text", "font", "resize", "palette", "direction", "alignment"})
+            QTest::newRow(change) << change;
+    }
+    void cacheFollowsChanges()
+    {
+        QFETCH(QString, change);
+        const auto changed = [&change](QWidget* inWidget) {
+            auto* turned = static_cast<ZuDirectionalLabel*>(inWidget);
+            if (change == "text")
+                turned->setText("Other");
+            if (change == "font")
+                turned->setFont(QFont(turned->font().family(), 20));
+            if (change == "resize")
+                turned->resize(30, 90);
+            if (change == "palette")
+                turned->setPalette(QPalette(Qt::red));
+            if (change == "direction")
+                turned->setDirection(ZuDirectionalLabel::BottomToTop);
+            if (change == "alignment")
+                turned->setAlignment(Qt::AlignCenter);
+            turned->update();
+            return inWidget;
+        };
+        Widget turned(label(2));
+        const QImage before = grabbed(*turned);
+        const QImage after = grabbed(*changed(turned.get()));
+        QVERIFY(after != before);
+        QCOMPARE(after, grabbed(*Widget(changed(label(2)))));
+    }
+
+    // Drawn at the screen's ratio, not enlarged from ratio 1; painted once, not in a loop.
+    void sharpAtRatio2()
+    {
+        for (const auto& make : {std::function<QWidget*()>([] { return label(3); }),
+                                 std::function<QWidget*()>(checkered)}) {
+            const QImage ratio1 = grabAtRatio(1, make), ratio2 = grabAtRatio(2, make);
+            QCOMPARE(ratio2.size(), ratio1.size() * 2);
+            const QImage fast = ratio1.scaled(ratio2.size());
+            const QImage smooth =
+                ratio1.scaled(ratio2.size(), Qt::IgnoreAspectRatio, Qt::SmoothTransformation);
+            int sharper = 0;
+            for (int y = 0; y < ratio2.height(); ++y)
+                for (int x = 0; x < ratio2.width(); ++x)
+                    sharper += ratio2.pixel(x, y) != fast.pixel(x, y) &&
+                               ratio2.pixel(x, y) != smooth.pixel(x, y);
+            QVERIFY2(sharper > 100, qPrintable(QString::number(sharper)));
+        }
+        const QImage checkers = grabAtRatio(2, checkered); // 200 pixmap pixels on 200 pixels
+        QCOMPARE(checkers.pixel(50, 50), qRgb(0, 0, 255));
+        QCOMPARE(checkers.pixel(51, 50), qRgb(255, 0, 0));
+
+        Widget shown(label(2));
+        shown->show();
+        QVERIFY(QTest::qWaitForWindowExposed(shown.get()));
+        QTest::qWait(50);
+        shown->grab();
+        QVERIFY(!shown->testAttribute(Qt::WA_PendingUpdate)); // painting asked for no repaint
+    }
+
+    // Fitted with its aspect ratio, centred, inside the frame; a null pixmap is not drawn.
+    void pixmapFit_data()
+    {
+        QTest::addColumn<QSize>("pixmap");
+        QTest::addColumn<QRect>("drawn");
+        QTest::newRow("wide") << QSize(200, 100) << QRect(1, 25, 98, 50);
+        QTest::newRow("tall") << QSize(100, 200) << QRect(25, 1, 50, 98);
+        QTest::newRow("odd") << QSize(30, 7) << QRect(1, 38, 98, 23);
+        QTest::newRow("null") << QSize() << QRect();
+    }
+    void pixmapFit()
+    {
+        QFETCH(QSize, pixmap);
+        QFETCH(QRect, drawn);
+        ZuPixmapWidget widget;
+        QPixmap red(pixmap);
+        red.fill(Qt::red);
+        widget.setPixmap(red);
+        widget.setBackgroundColor(Qt::blue);
+        widget.setFrameColor(Qt::green);
+        widget.resize(100, 100);
+        QCOMPARE(widget.sizeHint(), red.size());
+        const QImage image = grabbed(widget);
+        QCOMPARE(boxOf(image, [](QRgb p) { return p == qRgb(255, 0, 0); }), drawn);
+        QCOMPARE(boxOf(image, [](QRgb p) { return p != qRgb(0, 255, 0); }), QRect(1, 1, 98, 98));
+        QCOMPARE(boxOf(image, [](QRgb p) { return p == qRgb(0, 0, 255); }), QRect(1, 1, 98, 98));
+    }
+
+    // The box hugs the text in a 120 % font; unset colours follow the palette.
+    void overlay_data()
+    {
+        QTest::addColumn<QFont>("font");
+        QTest::addColumn<QFont>("overlayFont");
+        QTest::addColumn<int>("alignment");
+        QFont px12("DejaVu Sans"), px14 = px12, pt9 = px12, pt10 = px12;
+        px12.setPixelSize(12);
+        px14.setPixelSize(14);
+        pt9.setPointSize(9);
+        pt10.setPointSize(10);
+        QTest::newRow("12 px, centre") << px12 << px14 << int(Qt::AlignCenter);
+        QTest::newRow("9 pt, bottom right") << pt9 << pt10 << int(Qt::AlignBottom | Qt::AlignRight);
+        QTest::newRow("9 pt, top left") << pt9 << pt10 << int(Qt::AlignTop | Qt::AlignLeft);
+    }
+    void overlay()
+    {
+        QFETCH(QFont, font);
+        QFETCH(QFont, overlayFont);
+        QFETCH(int, alignment);
+        ZuPixmapWidget widget;
+        widget.setPalette(
+            QPalette(Qt::black, Qt::white, Qt::white, Qt::black, Qt::gray, Qt::black, Qt::white));
+        widget.setFont(font);
+        widget.resize(160, 90);
+        widget.setOverlayText("Series 3", Qt::Alignment(alignment));
+        QCOMPARE(QAccessible::queryAccessibleInterface(&widget)->text(QAccessible::Description),
+                 "Series 3");
+        const QRect inner(1, 1, 158, 88);
+        const QRect text = QFontMetrics(overlayFont, &widget)
+                               .boundingRect(QRect(0, 0, 159, 89), alignment, "Series 3");
+        QImage image = grabbed(widget);
+        const auto boxed = [](QRgb p) {
+            return p != qRgb(255, 255, 255) && p != qRgb(0, 0, 0);
+        };
+        QCOMPARE(boxOf(image, boxed) & inner, text.adjusted(-2, -2, 1, 1) & inner);
+        QCOMPARE(image.pixel(0, 0), qRgb(0, 0, 0)); // frame and text in WindowText
+        QVERIFY(boxOf(image, [](QRgb p) { return p == qRgb(0, 0, 0); }).intersects(text));
+
+        widget.setOverlayTextColor(Qt::yellow);
+        widget.setPalette(QPalette(Qt::cyan)); // a scheme switch
+        image = grabbed(widget);
+        const auto yellow = [](QRgb p) {
+            return p == qRgb(255, 255, 0);
+        };
+        QVERIFY(!boxOf(image, yellow).isEmpty());
+        const QPoint background = text.contains(5, 5) ? QPoint(150, 80) : QPoint(5, 5);
+        QCOMPARE(image.pixel(background), QPalette(Qt::cyan).color(QPalette::Window).rgb());
+        widget.setOverlayText(QString(), Qt::AlignCenter);
+        QCOMPARE(boxOf(grabbed(widget), yellow), QRect());
+    }
+};
+
+QTEST_MAIN(TstLabels)
+#include "tst_labels.moc"
