@@ -7,6 +7,8 @@
 #include <QStandardItemModel>
 #include <QtTest>
 
+#include <memory>
+
 namespace {
 
 // Shows every text of its source in capitals with a suffix, so proxied cells look different.
@@ -50,10 +52,10 @@ QImage paintCell(const QAbstractItemDelegate& inDelegate, const QModelIndex& inI
     return image;
 }
 
-// First column at or after inFrom with ink (-1: none).
-int inkFrom(const QImage& inImage, int inFrom)
+// First column with ink (-1: none).
+int inkFrom(const QImage& inImage)
 {
-    for (int x = inFrom; x < inImage.width(); ++x)
+    for (int x = 0; x < inImage.width(); ++x)
         for (int y = 0; y < inImage.height(); ++y)
             if (qGray(inImage.pixel(x, y)) < 128)
                 return x;
@@ -71,38 +73,48 @@ class TstItemDelegates : public QObject
 private Q_SLOTS:
     void init()
     {
-        mModel.setData(mModel.index(0, 0), "abc");
-        mOther.setData(mOther.index(0, 0), "xyz");
+        mModel.setData(mModel.index(0, 0), "a\tbc");
+        mOther.setData(mOther.index(0, 0), "x\tyz");
     }
 
-    // Cells of the proxy's source show the proxy's data; everything else is QItemDelegate.
+    // Cells of the proxy's source show the proxy's data, with tab stops; anything else is
+    // painted and sized like QItemDelegate.
     void proxyPainting_data()
     {
+        QTest::addColumn<bool>("tabstops");
         QTest::addColumn<QString>("situation");
         QTest::addColumn<bool>("proxied");
-        QTest::newRow("live proxy") << "live" << true;
-        QTest::newRow("no proxy") << "none" << false;
-        QTest::newRow("proxy destroyed") << "destroyed" << false;
-        QTest::newRow("index of another model") << "other" << false;
+        for (bool tabstops : {false, true}) {
+            const char* kind = tabstops ? "tab stops, " : "";
+            QTest::addRow("%slive proxy", kind) << tabstops << "live" << true;
+            QTest::addRow("%sno proxy", kind) << tabstops << "none" << false;
+            QTest::addRow("%sproxy destroyed", kind) << tabstops << "destroyed" << false;
+            QTest::addRow("%sindex of another model", kind) << tabstops << "other" << false;
+        }
     }
     void proxyPainting()
     {
+        QFETCH(bool, tabstops);
         QFETCH(QString, situation);
         QFETCH(bool, proxied);
-        auto* proxy = new Shouting;
+        auto proxy = std::make_unique<Shouting>();
         proxy->setSourceModel(&mModel);
-        ZuProxyModelItemDelegate delegate;
+        std::unique_ptr<ZuProxyModelItemDelegate> delegate(tabstops ? new ZuTabstopItemDelegate
+                                                                    : new ZuProxyModelItemDelegate);
+        if (tabstops)
+            static_cast<ZuTabstopItemDelegate*>(delegate.get())
+                ->setTabPatternForColumn(0, "WWWWWWWWWWWW\tx");
         if (situation != "none")
-            delegate.setProxyModel(proxy);
-        if (situation == "destroyed")
-            delete proxy;
+            delegate->setProxyModel(proxy.get());
         const QModelIndex index = (situation == "other" ? mOther : mModel).index(0, 0);
         const QModelIndex expected = proxied ? proxy->mapFromSource(index) : index;
+        if (situation == "destroyed")
+            proxy.reset();
         const QItemDelegate plain;
-        QCOMPARE(paintCell(delegate, index), paintCell(plain, expected));
-        QCOMPARE(delegate.sizeHint(cellOption(), index), plain.sizeHint(cellOption(), expected));
-        if (situation != "destroyed")
-            delete proxy;
+        const bool same = !proxied || !tabstops;
+        QCOMPARE(paintCell(*delegate, index) == paintCell(plain, expected), same);
+        QCOMPARE(delegate->sizeHint(cellOption(), index) == plain.sizeHint(cellOption(), expected),
+                 same);
     }
 
     // Stops after each sample and three blanks, in the cell's font or the measuring font;
@@ -128,8 +140,9 @@ private Q_SLOTS:
         QFETCH(QString, text);
         QFETCH(int, measuringPixels);
         QFETCH(QStringList, before);
-        mModel.setData(mModel.index(0, 1), text);
-        mModel.setData(mModel.index(0, 2), text);
+        const QModelIndex cell = mModel.index(0, 1), neighbour = mModel.index(0, 2);
+        mModel.setData(cell, text);
+        mModel.setData(neighbour, text);
         ZuTabstopItemDelegate delegate;
         delegate.createIdentityProxyModel(&mModel);
         delegate.setTabPatternForColumn(1, pattern);
@@ -138,45 +151,26 @@ private Q_SLOTS:
         if (measuringPixels)
             delegate.setFontForTabSize(&measuring);
         const QFontMetrics metrics(measuringPixels ? measuring : cellFont());
-        int stop = 0;
+        int stop = QApplication::style()->pixelMetric(QStyle::PM_FocusFrameHMargin) + 1;
         for (const QString& sample : before)
             stop += metrics.horizontalAdvance(sample + "   ");
-        const int margin = QApplication::style()->pixelMetric(QStyle::PM_FocusFrameHMargin) + 1;
-        const int ink = inkFrom(paintCell(delegate, mModel.index(0, 1)), 0);
-        QVERIFY2(ink >= margin + stop && ink <= margin + stop + 2,
-                 qPrintable(QString::number(ink)));
-        QCOMPARE(inkFrom(paintCell(delegate, mModel.index(0, 2)), 0), ink);
+        const int ink = inkFrom(paintCell(delegate, cell));
+        QVERIFY2(ink >= stop && ink <= stop + 2, qPrintable(QString::number(ink)));
+        QCOMPARE(inkFrom(paintCell(delegate, neighbour)), ink);
         // Wide enough for the tabbed text (nothing elided), with QItemDelegate's padding only.
-        const int width = delegate.sizeHint(cellOption(), mModel.index(0, 1)).width();
-        const int needed = margin + stop + QFontMetrics(cellFont()).horizontalAdvance("H");
+        const int width = delegate.sizeHint(cellOption(), cell).width();
+        const int needed = stop + QFontMetrics(cellFont()).horizontalAdvance("H");
         QVERIFY2(width > needed && width <= needed + 12, qPrintable(QString::number(width)));
-        QCOMPARE(paintCell(delegate, mModel.index(0, 1), width),
-                 paintCell(delegate, mModel.index(0, 1)).copy(0, 0, width, 24));
+        QCOMPARE(paintCell(delegate, cell, width), paintCell(delegate, cell).copy(0, 0, width, 24));
+
         // Without its pattern a column is plain again, and keeps no stops from other cells.
         delegate.setTabPatternForColumn(1, QString());
         QCOMPARE(delegate.tabPatternForColumn(1), QString());
         QCOMPARE(delegate.tabPatternForColumn(2), pattern);
-        const QItemDelegate plain;
-        QCOMPARE(paintCell(delegate, mModel.index(0, 1)), paintCell(plain, mModel.index(0, 1)));
-        QCOMPARE(delegate.sizeHint(cellOption(), mModel.index(0, 1)),
-                 plain.sizeHint(cellOption(), mModel.index(0, 1)));
-        QCOMPARE(inkFrom(paintCell(delegate, mModel.index(0, 2)), 0), ink);
-        // Back to the cell's font.
-        delegate.setFontForTabSize(nullptr);
-        if (measuringPixels)
-            QVERIFY(inkFrom(paintCell(delegate, mModel.index(0, 2)), 0) < ink);
-    }
-
-    // Tab stops are a matter of the proxied cells only.
-    void noStopsWithoutProxy()
-    {
-        mModel.setData(mModel.index(0, 1), "\tH");
-        ZuTabstopItemDelegate delegate;
-        delegate.setTabPatternForColumn(1, "WWWWWWWWWWWWWWWW\tx");
-        const QItemDelegate plain;
-        QCOMPARE(paintCell(delegate, mModel.index(0, 1)), paintCell(plain, mModel.index(0, 1)));
-        QCOMPARE(delegate.sizeHint(cellOption(), mModel.index(0, 1)),
-                 plain.sizeHint(cellOption(), mModel.index(0, 1)));
+        QCOMPARE(paintCell(delegate, cell), paintCell(QItemDelegate(), cell));
+        QCOMPARE(inkFrom(paintCell(delegate, neighbour)), ink);
+        delegate.setFontForTabSize(nullptr); // back to the cell's font
+        QCOMPARE(inkFrom(paintCell(delegate, neighbour)) < ink, measuringPixels > 0);
     }
 };
 

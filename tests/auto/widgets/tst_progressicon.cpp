@@ -12,25 +12,15 @@
 
 namespace {
 
-// The red channel tells the test frames apart: frame n is (20 n, 255 - 20 n, 7).
-int frameOf(const QIcon& inIcon)
-{
-    if (inIcon.isNull())
-        return -1;
-    return qRed(inIcon.pixmap(4, 4).toImage().pixel(1, 1)) / 20;
-}
-
-// The colour of dot d of a frame, read at the dot's centre.
+// The grey of dot d of a spinner frame, read at the dot's centre.
 int greyOfDot(const QImage& inFrame, int inDot)
 {
-    const double angle = inDot * 3.14159 / 4;
-    const qreal ratio = inFrame.devicePixelRatio();
-    const QRgb pixel = inFrame.pixel(qRound((12 + 8 * std::cos(angle)) * ratio - 0.5),
-                                     qRound((12 + 8 * std::sin(angle)) * ratio - 0.5));
-    return qAlpha(pixel) > 100 ? qRed(pixel) : -1;
+    const double angle = inDot * 3.14159 / 4, ratio = inFrame.devicePixelRatio();
+    return qRed(inFrame.pixel(qRound((12 + 8 * std::cos(angle)) * ratio - 0.5),
+                              qRound((12 + 8 * std::sin(angle)) * ratio - 0.5)));
 }
 
-// Event-loop wake-ups in 350 ms: one or two of the loop's own, three or more of a 100 ms timer.
+// Event-loop wake-ups in 350 ms: one or two of the loop's own, three more of a 100 ms timer.
 int wakeUps()
 {
     int count = 0;
@@ -43,16 +33,17 @@ int wakeUps()
     return count;
 }
 
-struct Recorder
+char sKeys[4]; // places of icons
+QString sLog;  // "<place>:<frame> " per setter call; the test frame n has red 20 n, -1: empty
+
+std::function<void(const QIcon&)> logger(int inPlace)
 {
-    QList<int> frames; // -1: the empty icon
-    std::function<void(const QIcon&)> setter()
-    {
-        return [this](const QIcon& inIcon) {
-            frames << frameOf(inIcon);
-        };
-    }
-};
+    return [inPlace](const QIcon& inIcon) {
+        const int frame =
+            inIcon.isNull() ? -1 : qRed(inIcon.pixmap(4, 4).toImage().pixel(1, 1)) / 20;
+        sLog += QString("%1:%2 ").arg(inPlace).arg(frame);
+    };
+}
 
 } // namespace
 
@@ -61,9 +52,20 @@ class TstProgressIcon : public QObject
     Q_OBJECT
 
 private Q_SLOTS:
-    // The first frame after 100 ms is frame 1; eight later the sequence wraps to frame 0.
-    void spinnerFrames()
+    void init() { sLog.clear(); }
+    void cleanup() { QHighDpiScaling::setGlobalFactor(1); }
+
+    // After 100 ms frame 1, after eight frame 0; at ratio 2 drawn anew, not enlarged.
+    void spinner_data()
     {
+        QTest::addColumn<int>("ratio");
+        QTest::newRow("1") << 1;
+        QTest::newRow("2") << 2;
+    }
+    void spinner()
+    {
+        QFETCH(int, ratio);
+        QHighDpiScaling::setGlobalFactor(ratio);
         ZuProgressIcon icon;
         QSignalSpy frames(&icon, &ZuProgressIcon::nextPixmap);
         QElapsedTimer clock;
@@ -71,15 +73,21 @@ private Q_SLOTS:
         icon.start();
         QTRY_COMPARE_WITH_TIMEOUT(frames.count(), 1, 2000);
         QVERIFY(clock.elapsed() >= 90);
-        const QImage first = frames.at(0).at(0).value<QPixmap>().toImage();
-        QCOMPARE(first.size(), QSize(24, 24));
-        QCOMPARE(greyOfDot(first, 1), 60);
         QTRY_COMPARE_WITH_TIMEOUT(frames.count(), 8, 3000);
+        const QImage first = frames.at(0).at(0).value<QPixmap>().toImage();
         const QImage frame0 = frames.at(7).at(0).value<QPixmap>().toImage();
+        QCOMPARE(first.size(), QSize(24, 24) * ratio);
+        QCOMPARE(first.devicePixelRatio(), qreal(ratio));
+        QCOMPARE(greyOfDot(first, 1), 60);
         QList<int> greys;
         for (int dot = 0; dot < 8; ++dot)
             greys << greyOfDot(frame0, dot);
         QCOMPARE(greys, (QList<int>{60, 200, 200, 200, 200, 120, 100, 80}));
+        if (ratio == 2) {
+            const QImage small = QPixmap::fromImage(first).scaled(24, 24).toImage();
+            QVERIFY(first != small.scaled(48, 48));
+            QVERIFY(first != small.scaled(48, 48, Qt::IgnoreAspectRatio, Qt::SmoothTransformation));
+        }
 
         // Busy while running; stopping keeps the place in the sequence.
         QAccessibleInterface* accessible = QAccessible::queryAccessibleInterface(&icon);
@@ -88,109 +96,61 @@ private Q_SLOTS:
         icon.stop();
         QVERIFY(!accessible->state().busy);
         QTest::qWait(250);
-        QCOMPARE(frames.count(), 8);
         icon.start();
         QTRY_COMPARE_WITH_TIMEOUT(frames.count(), 9, 2000);
         QCOMPARE(frames.at(8).at(0).value<QPixmap>().toImage(), first);
-    }
-
-    void spinnerAtRatio2()
-    {
-        QImage frames[2];
-        for (int ratio : {1, 2}) {
-            QHighDpiScaling::setGlobalFactor(ratio);
-            ZuProgressIcon icon;
-            QSignalSpy spy(&icon, &ZuProgressIcon::nextPixmap);
-            icon.start();
-            QTRY_COMPARE_WITH_TIMEOUT(spy.count(), 1, 2000);
-            const QPixmap pixmap = spy.at(0).at(0).value<QPixmap>();
-            QCOMPARE(pixmap.devicePixelRatio(), qreal(ratio));
-            frames[ratio - 1] = pixmap.toImage();
-        }
-        QHighDpiScaling::setGlobalFactor(1);
-        QCOMPARE(frames[1].size(), QSize(48, 48));
-        QCOMPARE(greyOfDot(frames[1], 1), 60);
-        QVERIFY(frames[1] != frames[0].scaled(48, 48));
-        QVERIFY(frames[1] !=
-                frames[0].scaled(48, 48, Qt::IgnoreAspectRatio, Qt::SmoothTransformation));
     }
 
     // Without the host's images every place gets null icons, and nothing breaks.
     void animatorWithoutFrames()
     {
         Q_CLEANUP_RESOURCE(progressframes);
-        Recorder place;
-        ZuAnimatedProgressIcon::setIconTo(&place, place.setter());
-        QTRY_COMPARE_WITH_TIMEOUT(place.frames.count(), 2, 2000);
-        ZuAnimatedProgressIcon::removeIconFrom(&place);
-        QCOMPARE(place.frames, (QList<int>{-1, -1, -1}));
+        ZuAnimatedProgressIcon::setIconTo(sKeys, logger(0));
+        QTRY_COMPARE_WITH_TIMEOUT(sLog, "0:-1 0:-1 ", 2000);
+        ZuAnimatedProgressIcon::removeIconFrom(sKeys);
         Q_INIT_RESOURCE(progressframes);
     }
 
-    // Frames 1, 2, ... to every place in key order; the 13th is frame 1 again. Unknown keys,
-    // replaced setters and the last removal behave.
+    // Frames 1, 2, ... to every place in key order, the 13th is frame 1 again; unknown keys
+    // and replaced setters change nothing; the last removal stops the timer.
     void animatorFrames()
     {
-        Recorder places[2], replaced;
-        QList<int> order;
-        ZuAnimatedProgressIcon::setIconTo(&places[1], [&](const QIcon& inIcon) {
-            order << 1;
-            places[1].frames << frameOf(inIcon);
-        });
-        ZuAnimatedProgressIcon::setIconTo(&places[0], replaced.setter());
-        ZuAnimatedProgressIcon::setIconTo(&places[0], [&](const QIcon& inIcon) {
-            order << 0;
-            places[0].frames << frameOf(inIcon);
-        });
-        QVERIFY(places[0].frames.isEmpty());            // not called at once
-        ZuAnimatedProgressIcon::removeIconFrom(&order); // never registered
-        QTRY_COMPARE_WITH_TIMEOUT(places[0].frames.count(), 13, 5000);
-        QCOMPARE(places[0].frames, (QList<int>{1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 0, 1}));
-        QCOMPARE(order.mid(0, 4), (QList<int>{0, 1, 0, 1}));
-        QVERIFY(replaced.frames.isEmpty());
+        ZuAnimatedProgressIcon::setIconTo(sKeys + 1, logger(1));
+        ZuAnimatedProgressIcon::setIconTo(sKeys, logger(9));
+        ZuAnimatedProgressIcon::setIconTo(sKeys, logger(0)); // replaces 9
+        QCOMPARE(sLog, "");                                  // not called at once
+        ZuAnimatedProgressIcon::removeIconFrom(sKeys + 3);
+        QTRY_COMPARE_WITH_TIMEOUT(sLog.count(' '), 26, 5000);
+        QCOMPARE(sLog, "0:1 1:1 0:2 1:2 0:3 1:3 0:4 1:4 0:5 1:5 0:6 1:6 0:7 1:7 0:8 1:8 0:9 1:9 "
+                       "0:10 1:10 0:11 1:11 0:0 1:0 0:1 1:1 ");
         const int busy = wakeUps();
         QVERIFY2(busy >= 4, qPrintable(QString::number(busy)));
-
-        ZuAnimatedProgressIcon::removeIconFrom(&places[0]);
-        ZuAnimatedProgressIcon::removeIconFrom(&places[1]);
-        QCOMPARE(places[1].frames.last(), -1);
-        const int calls = places[1].frames.count();
+        sLog.clear();
+        ZuAnimatedProgressIcon::removeIconFrom(sKeys);
+        ZuAnimatedProgressIcon::removeIconFrom(sKeys + 1);
         const int idle = wakeUps();
         QVERIFY2(idle <= 2, qPrintable(QString::number(idle))); // the timer is stopped
-        QCOMPARE(places[1].frames.count(), calls);
-        ZuAnimatedProgressIcon::setIconTo(&places[1], places[1].setter());
-        QTRY_COMPARE_WITH_TIMEOUT(places[1].frames.count(), calls + 1, 2000);
-        QCOMPARE(places[1].frames.last(), 1); // a restart begins at frame 1
-        ZuAnimatedProgressIcon::removeIconFrom(&places[1]);
+        ZuAnimatedProgressIcon::setIconTo(sKeys + 1, logger(1));
+        QTRY_COMPARE_WITH_TIMEOUT(sLog, "0:-1 1:-1 1:1 ", 2000); // a restart begins at frame 1
+        ZuAnimatedProgressIcon::removeIconFrom(sKeys + 1);
     }
 
-    // Setters that register or unregister keys while a frame is handed out.
+    // A setter that removes itself and another place and adds a third while it is called.
     void setterChangesRegistrations()
     {
-        Recorder places[4];
-        int selfRemovals = 0;
-        // places[0] removes itself and places[2], and adds places[3] (first called next frame).
-        ZuAnimatedProgressIcon::setIconTo(&places[0], [&](const QIcon& inIcon) {
-            places[0].frames << frameOf(inIcon);
-            if (inIcon.isNull())
-                ++selfRemovals;
-            else {
-                ZuAnimatedProgressIcon::removeIconFrom(&places[2]);
-                ZuAnimatedProgressIcon::setIconTo(&places[3], places[3].setter());
-                ZuAnimatedProgressIcon::removeIconFrom(&places[0]);
+        ZuAnimatedProgressIcon::setIconTo(sKeys, [](const QIcon& inIcon) {
+            logger(0)(inIcon);
+            if (!inIcon.isNull()) {
+                ZuAnimatedProgressIcon::removeIconFrom(sKeys + 2);
+                ZuAnimatedProgressIcon::setIconTo(sKeys + 3, logger(3));
+                ZuAnimatedProgressIcon::removeIconFrom(sKeys);
             }
         });
-        for (int i : {1, 2})
-            ZuAnimatedProgressIcon::setIconTo(&places[i], places[i].setter());
-        QTRY_COMPARE_WITH_TIMEOUT(places[1].frames.count(), 1, 2000);
-        QCOMPARE(places[0].frames, (QList<int>{1, -1}));
-        QCOMPARE(selfRemovals, 1);
-        QCOMPARE(places[2].frames, (QList<int>{-1}));
-        QVERIFY(places[3].frames.isEmpty());
-        QTRY_COMPARE_WITH_TIMEOUT(places[3].frames.count(), 1, 2000);
-        QCOMPARE(places[3].frames, (QList<int>{2}));
-        for (int i : {1, 3})
-            ZuAnimatedProgressIcon::removeIconFrom(&places[i]);
+        ZuAnimatedProgressIcon::setIconTo(sKeys + 1, logger(1));
+        ZuAnimatedProgressIcon::setIconTo(sKeys + 2, logger(2));
+        QTRY_COMPARE_WITH_TIMEOUT(sLog, "0:1 2:-1 0:-1 1:1 1:2 3:2 ", 2000);
+        ZuAnimatedProgressIcon::removeIconFrom(sKeys + 1);
+        ZuAnimatedProgressIcon::removeIconFrom(sKeys + 3);
     }
 };
 
