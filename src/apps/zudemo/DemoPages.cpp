@@ -8,6 +8,7 @@
 // Widgets II
 
 // Widgets III
+#include "DemoWidgetsViewsPage.h"
 
 // Widgets IV
 
@@ -54,6 +55,7 @@ const std::vector<DemoPage>& demoPages()
         // Widgets II
 
         // Widgets III
+        {"widgets-views", "Tabs, views, dates", &make<DemoWidgetsViewsPage>},
 
         // Widgets IV
 
