@@ -156,6 +156,7 @@ private Q_SLOTS:
         bar()->setAccessibleTabName(1, "Series"); // the host's own name stays
         QAccessibleInterface* tabs = QAccessible::queryAccessibleInterface(bar());
         QCOMPARE(tabs->child(3)->text(QAccessible::Name), "New tab");
+        QCOMPARE(tabs->child(0)->text(QAccessible::Name), "A");
         bar()->setTabText(3, "D");
         QTRY_COMPARE(tabs->child(3)->text(QAccessible::Name), "D");
         QCOMPARE(tabs->child(1)->text(QAccessible::Name), "Series");
