@@ -165,7 +165,6 @@ private Q_SLOTS:
 
         // Without its pattern a column is plain again, and keeps no stops from other cells.
         delegate.setTabPatternForColumn(1, QString());
-        QCOMPARE(delegate.tabPatternForColumn(1), QString());
         QCOMPARE(delegate.tabPatternForColumn(2), pattern);
         QCOMPARE(paintCell(delegate, cell), paintCell(QItemDelegate(), cell));
         QCOMPARE(inkFrom(paintCell(delegate, neighbour)), ink);
