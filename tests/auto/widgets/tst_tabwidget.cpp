@@ -130,6 +130,7 @@ private Q_SLOTS:
         bar()->setTabText(3, "D");
         QTRY_COMPARE(tabs->child(3)->text(QAccessible::Name), "D");
         QCOMPARE(tabs->child(2)->text(QAccessible::Name), "Series");
+        QCOMPARE(tabs->child(0)->text(QAccessible::Name), "A");
         bar()->setTabText(3, "+");
 
         mTabs->removeTab(0);
