@@ -3,6 +3,7 @@
 #include "zubase/ZuTabWidget.h"
 
 #include <QAccessible>
+#include <QProxyStyle>
 #include <QToolButton>
 #include <QtTest>
 
@@ -24,6 +25,21 @@ class TstTabWidget : public QObject
     }
 
 private Q_SLOTS:
+    // A style that prefers no scroll arrows: the tab widget turns them on all the same.
+    void initTestCase()
+    {
+        struct NoArrows : QProxyStyle
+        {
+            int styleHint(StyleHint inHint, const QStyleOption* inOption, const QWidget* inWidget,
+                          QStyleHintReturn* outData) const override
+            {
+                return inHint == SH_TabBar_PreferNoArrows
+                           ? 1
+                           : QProxyStyle::styleHint(inHint, inOption, inWidget, outData);
+            }
+        };
+        QApplication::setStyle(new NoArrows);
+    }
     void init()
     {
         mTabs = std::make_unique<ZuTabWidget>();
