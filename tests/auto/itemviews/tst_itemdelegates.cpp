@@ -43,23 +43,24 @@ QStyleOptionViewItem cellOption(int inWidth = 400)
 }
 
 QImage paintCell(const QAbstractItemDelegate& inDelegate, const QModelIndex& inIndex,
-                 int inWidth = 400)
+                 const QStyleOptionViewItem& inOption = cellOption())
 {
-    QImage image(inWidth, 24, QImage::Format_RGB32);
+    QImage image(inOption.rect.size(), QImage::Format_RGB32);
     image.fill(Qt::white);
     QPainter painter(&image);
-    inDelegate.paint(&painter, cellOption(inWidth), inIndex);
+    inDelegate.paint(&painter, inOption, inIndex);
     return image;
 }
 
-// First column with ink (-1: none).
-int inkFrom(const QImage& inImage)
+// Bounding box of the ink.
+QRect inkOf(const QImage& inImage)
 {
-    for (int x = 0; x < inImage.width(); ++x)
-        for (int y = 0; y < inImage.height(); ++y)
+    QRect box;
+    for (int y = 0; y < inImage.height(); ++y)
+        for (int x = 0; x < inImage.width(); ++x)
             if (qGray(inImage.pixel(x, y)) < 128)
-                return x;
-    return -1;
+                box |= QRect(x, y, 1, 1);
+    return box;
 }
 
 } // namespace
@@ -154,22 +155,51 @@ private Q_SLOTS:
         int stop = QApplication::style()->pixelMetric(QStyle::PM_FocusFrameHMargin) + 1;
         for (const QString& sample : before)
             stop += metrics.horizontalAdvance(sample + "   ");
-        const int ink = inkFrom(paintCell(delegate, cell));
+        const int ink = inkOf(paintCell(delegate, cell)).x();
         QVERIFY2(ink >= stop && ink <= stop + 2, qPrintable(QString::number(ink)));
-        QCOMPARE(inkFrom(paintCell(delegate, neighbour)), ink);
+        QCOMPARE(inkOf(paintCell(delegate, neighbour)).x(), ink);
         // Wide enough for the tabbed text (nothing elided), with QItemDelegate's padding only.
         const int width = delegate.sizeHint(cellOption(), cell).width();
         const int needed = stop + QFontMetrics(cellFont()).horizontalAdvance("H");
         QVERIFY2(width > needed && width <= needed + 12, qPrintable(QString::number(width)));
-        QCOMPARE(paintCell(delegate, cell, width), paintCell(delegate, cell).copy(0, 0, width, 24));
+        QCOMPARE(paintCell(delegate, cell, cellOption(width)),
+                 paintCell(delegate, cell).copy(0, 0, width, 24));
 
         // Without its pattern a column is plain again, and keeps no stops from other cells.
         delegate.setTabPatternForColumn(1, QString());
         QCOMPARE(delegate.tabPatternForColumn(2), pattern);
         QCOMPARE(paintCell(delegate, cell), paintCell(QItemDelegate(), cell));
-        QCOMPARE(inkFrom(paintCell(delegate, neighbour)), ink);
+        QCOMPARE(inkOf(paintCell(delegate, neighbour)).x(), ink);
         delegate.setFontForTabSize(nullptr); // back to the cell's font
-        QCOMPARE(inkFrom(paintCell(delegate, neighbour)) < ink, measuringPixels > 0);
+        QCOMPARE(inkOf(paintCell(delegate, neighbour)).x() < ink, measuringPixels > 0);
+    }
+
+    // Lines stack, alignment holds, a cell that overflows without clipping is clipped to its
+    // text and leaves the painter as it found it.
+    void layout()
+    {
+        const QModelIndex cell = mModel.index(0, 1);
+        mModel.setData(cell, "a\tH\nb\tH");
+        ZuTabstopItemDelegate delegate;
+        delegate.createIdentityProxyModel(&mModel);
+        delegate.setTabPatternForColumn(1, "WWWW\tx");
+        QStyleOptionViewItem option = cellOption();
+        option.rect.setHeight(40);
+        const QRect twoLines = inkOf(paintCell(delegate, cell, option));
+        QVERIFY(twoLines.height() > 2 * QFontMetrics(cellFont()).capHeight());
+        option.displayAlignment = Qt::AlignRight | Qt::AlignVCenter;
+        QVERIFY(inkOf(paintCell(delegate, cell, option)).right() > 390);
+
+        delegate.setClipping(false); // two lines overflow 24 pixels
+        static QStringList sWarnings;
+        const QtMessageHandler previous =
+            qInstallMessageHandler([](QtMsgType, const QMessageLogContext&, const QString& inText) {
+                sWarnings << inText;
+            });
+        const QRect overflowing = inkOf(paintCell(delegate, cell));
+        qInstallMessageHandler(previous);
+        QCOMPARE(sWarnings, QStringList()); // saves and restores of the painter balance
+        QVERIFY(overflowing.top() == 0 && overflowing.bottom() == 23);
     }
 };
 
