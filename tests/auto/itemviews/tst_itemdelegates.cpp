@@ -190,15 +190,17 @@ private Q_SLOTS:
         option.displayAlignment = Qt::AlignRight | Qt::AlignVCenter;
         QVERIFY(inkOf(paintCell(delegate, cell, option)).right() > 390);
 
-        delegate.setClipping(false); // two lines overflow 24 pixels
-        static QStringList sWarnings;
+        static QStringList sWarnings; // two lines overflow 24 pixels, with clipping and without
         const QtMessageHandler previous =
             qInstallMessageHandler([](QtMsgType, const QMessageLogContext&, const QString& inText) {
                 sWarnings << inText;
             });
+        const QRect clipped = inkOf(paintCell(delegate, cell));
+        delegate.setClipping(false);
         const QRect overflowing = inkOf(paintCell(delegate, cell));
         qInstallMessageHandler(previous);
         QCOMPARE(sWarnings, QStringList()); // saves and restores of the painter balance
+        QCOMPARE(overflowing, clipped);
         QVERIFY(overflowing.top() == 0 && overflowing.bottom() == 23);
     }
 };
