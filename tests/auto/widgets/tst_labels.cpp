@@ -38,7 +38,7 @@ ZuDirectionalLabel* label(int inDirection, const QSize& inSize = {30, 120})
     auto* label = new ZuDirectionalLabel;
     label->setText("Caption");
     label->setPalette(kPalette);
-    label->setAlignment(Qt::AlignLeft | Qt::AlignTop);
+    label->setAlignment(Qt::AlignRight | Qt::AlignBottom);
     label->setDirection(ZuDirectionalLabel::Direction(inDirection));
     label->resize(inSize);
     return label;
@@ -105,7 +105,8 @@ private Q_SLOTS:
                  "Caption");
     }
 
-    // After a change the label shows what a new label in that state shows.
+    // After a change the label shows what a new label in that state shows; without one the
+    // rendering is reused (each rendering makes a child label).
     void cacheFollowsChanges()
     {
         using Label = ZuDirectionalLabel;
@@ -115,8 +116,9 @@ private Q_SLOTS:
             [](Label* inLabel) { inLabel->resize(30, 90); },
             [](Label* inLabel) { inLabel->setPalette(QPalette(Qt::red)); },
             [](Label* inLabel) { inLabel->setDirection(Label::BottomToTop); },
+            [](Label* inLabel) { inLabel->setAlignment(Qt::AlignCenter); },
             [](Label* inLabel) {
-                inLabel->setAlignment(Qt::AlignCenter);
+                inLabel->setMargin(6);
             }};
         for (const auto& change : changes) {
             std::unique_ptr<Label> turned(label(2)), fresh(label(2));
@@ -128,6 +130,22 @@ private Q_SLOTS:
             QVERIFY(after != before);
             QCOMPARE(after, grabbed(*fresh));
         }
+        std::unique_ptr<Label> turned(label(2));
+        grabbed(*turned);
+        int children = 0;
+        struct Counter : QObject
+        {
+            int* count;
+            bool eventFilter(QObject*, QEvent* inEvent) override
+            {
+                *count += inEvent->type() == QEvent::ChildAdded;
+                return false;
+            }
+        } counter;
+        counter.count = &children;
+        turned->installEventFilter(&counter);
+        grabbed(*turned);
+        QCOMPARE(children, 0);
     }
 
     // Drawn at the screen's ratio, not enlarged from ratio 1.
@@ -146,6 +164,9 @@ private Q_SLOTS:
                     sharper += ratio2.pixel(x, y) != fast.pixel(x, y) &&
                                ratio2.pixel(x, y) != smooth.pixel(x, y);
             QVERIFY2(sharper > 100, qPrintable(QString::number(sharper)));
+            const QRect ink1 = boxOf(ratio1), ink2 = boxOf(ratio2); // the same place, doubled
+            QVERIFY((ink2.topLeft() - 2 * ink1.topLeft()).manhattanLength() <= 4);
+            QVERIFY((ink2.bottomRight() - 2 * ink1.bottomRight()).manhattanLength() <= 4);
         }
     }
 

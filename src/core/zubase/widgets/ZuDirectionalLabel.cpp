@@ -91,8 +91,8 @@ void ZuDirectionalLabel::paintEvent(QPaintEvent* inEvent)
         const qreal angle = d->direction == UpsideDown    ? 180
                             : d->direction == TopToBottom ? 90
                                                           : -90;
-        d->image = image.transformed(QTransform().rotate(angle), Qt::FastTransformation);
-        d->image.setDevicePixelRatio(ratio);
+        d->image = image.transformed(QTransform().rotate(angle),
+                                     Qt::FastTransformation); // keeps the ratio
     }
     QPainter painter(this);
     painter.drawImage(QPoint(0, 0), d->image);
