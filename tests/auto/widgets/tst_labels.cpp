@@ -233,6 +233,7 @@ private Q_SLOTS:
                 inner,
             text.adjusted(-2, -2, 1, 1) & inner);
         QCOMPARE(image.pixel(0, 0), qRgb(0, 0, 0)); // frame and text in WindowText
+        QVERIFY(qAbs(qRed(image.pixel(text.topLeft() - QPoint(1, 1))) - 166) <= 1); // 70 % grey
         QVERIFY(boxOf(image.copy(text)).isValid());
 
         widget.setOverlayTextColor(Qt::yellow);

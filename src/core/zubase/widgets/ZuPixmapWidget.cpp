@@ -58,10 +58,10 @@ QRect ZuPixmapWidget::fitIntoRect(const QRect& inRect, const QSize& inSize) cons
     // 64 bits: a large pixmap in a large widget overflows the products in int.
     const qint64 width = inRect.width();
     const qint64 height = inRect.height();
+    if (inSize.isEmpty())
+        return QRect(); // a null pixmap: nothing to divide by
     const qint64 sourceWidth = inSize.width();
     const qint64 sourceHeight = inSize.height();
-    if (sourceWidth <= 0 || sourceHeight <= 0)
-        return QRect();
     const qint64 heightForWidth = sourceHeight * width / sourceWidth;
     const qint64 widthForHeight = sourceWidth * height / sourceHeight;
     if (heightForWidth > height)
