@@ -12,12 +12,13 @@
 
 namespace {
 
-// The grey of dot d of a spinner frame, read at the dot's centre.
+// The grey of dot d of a spinner frame, read at the dot's centre (-1: not a grey).
 int greyOfDot(const QImage& inFrame, int inDot)
 {
     const double angle = inDot * 3.14159 / 4, ratio = inFrame.devicePixelRatio();
-    return qRed(inFrame.pixel(qRound((12 + 8 * std::cos(angle)) * ratio - 0.5),
-                              qRound((12 + 8 * std::sin(angle)) * ratio - 0.5)));
+    const QRgb pixel = inFrame.pixel(qRound((12 + 8 * std::cos(angle)) * ratio - 0.5),
+                                     qRound((12 + 8 * std::sin(angle)) * ratio - 0.5));
+    return qRed(pixel) == qGreen(pixel) && qGreen(pixel) == qBlue(pixel) ? qRed(pixel) : -1;
 }
 
 // Event-loop wake-ups in 350 ms: one or two of the loop's own, three more of a 100 ms timer.
@@ -89,16 +90,20 @@ private Q_SLOTS:
             QVERIFY(first != small.scaled(48, 48, Qt::IgnoreAspectRatio, Qt::SmoothTransformation));
         }
 
-        // Busy while running; stopping keeps the place in the sequence.
+        // Busy while running; stopping keeps the place in the sequence; frames
+        // follow a change of the screens' ratio.
         QAccessibleInterface* accessible = QAccessible::queryAccessibleInterface(&icon);
         QCOMPARE(accessible->role(), QAccessible::Animation);
         QVERIFY(accessible->state().busy);
         icon.stop();
         QVERIFY(!accessible->state().busy);
         QTest::qWait(250);
+        QHighDpiScaling::setGlobalFactor(3 - ratio);
         icon.start();
         QTRY_COMPARE_WITH_TIMEOUT(frames.count(), 9, 2000);
-        QCOMPARE(frames.at(8).at(0).value<QPixmap>().toImage(), first);
+        const QImage ninth = frames.at(8).at(0).value<QPixmap>().toImage();
+        QCOMPARE(ninth.devicePixelRatio(), qreal(3 - ratio));
+        QCOMPARE(greyOfDot(ninth, 1), 60);
     }
 
     // Without the host's images every place gets null icons, and nothing breaks.
