@@ -14,11 +14,8 @@ ZuAnimatedProgressIcon::ZuAnimatedProgressIcon()
     QObject::connect(&mTimer, &QTimer::timeout, [this] { progressAnimation(); });
 }
 
-ZuAnimatedProgressIcon::~ZuAnimatedProgressIcon()
-{
-    if (mInstance == this)
-        mInstance = nullptr;
-}
+// The instance lives until the process ends: nobody outside can reach it to delete it.
+ZuAnimatedProgressIcon::~ZuAnimatedProgressIcon() = default;
 
 ZuAnimatedProgressIcon* ZuAnimatedProgressIcon::instance()
 {
@@ -72,6 +69,7 @@ void ZuAnimatedProgressIcon::progressAnimation()
     keys.reserve(mSetters.size());
     for (const auto& entry : mSetters)
         keys.push_back(entry.first);
+    // A counter, not a flag: a setter that runs a nested event loop may see a nested frame.
     const unsigned changes = mChanges;
     auto entry = mSetters.begin();
     for (void* key : keys) {
