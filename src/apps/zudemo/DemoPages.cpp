@@ -10,6 +10,7 @@
 #include "DemoWidgetsFieldsPage.h"
 
 // Widgets III
+#include "DemoWidgetsViewsPage.h"
 
 // Widgets IV
 
@@ -58,6 +59,7 @@ const std::vector<DemoPage>& demoPages()
         {"widgets-fields", "Fields and buttons", &make<DemoWidgetsFieldsPage>},
 
         // Widgets III
+        {"widgets-views", "Tabs, views, dates", &make<DemoWidgetsViewsPage>},
 
         // Widgets IV
 
