@@ -247,6 +247,11 @@ void tst_FindReplace::marksLeaveDocumentAlone()
     dark.setColor(QPalette::Base, QColor(20, 20, 20));
     f.edit->setPalette(dark);
     QCOMPARE(f.edit->extraSelections().last().format.foreground().color(), QColor(20, 20, 20));
+    f.dialog->replaceAll("and", "plus", Qt::CaseSensitive, false, false); // marks go, too
+    QCOMPARE(marks(), QStringList{"#000000"});
+    f.find->setText(QStringLiteral("plus"));
+    QVERIFY(QMetaObject::invokeMethod(f.dialog, "findAllClicked"));
+    QCOMPARE(marks(), QStringList({"#000000", "plus#00ff00"}));
     delete f.dialog; // the marks go with the dialog
     QCOMPARE(marks(), QStringList{"#000000"});
 }

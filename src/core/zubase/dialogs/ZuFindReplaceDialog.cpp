@@ -282,6 +282,10 @@ void ZuFindReplaceDialog::replaceAll(const QString& inFind, const QString& inRep
 {
     if (!d->document || d->document->isReadOnly())
         return;
+    // The marks are on the matches that go now; and every mark is a cursor the document would
+    // move along at each replacement, which made this quadratic.
+    d->removeMarks();
+    d->marks = 0;
     forEachMatch(d->document->document(), inFind, findFlags(inCase, inWholeWords, false),
                  [&](QTextCursor& ioMatch) {
                      // One undo step per replacement, never a removal on its own.
