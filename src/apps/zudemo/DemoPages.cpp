@@ -10,7 +10,7 @@
 // Widgets III
 
 // Widgets IV
-
+#include "DemoWidgetsTextPage.h"
 
 #include <QLabel>
 #include <QPlainTextEdit>
@@ -56,6 +56,7 @@ const std::vector<DemoPage>& demoPages()
         // Widgets III
 
         // Widgets IV
+        {"widgets-text", "Text and input", &make<DemoWidgetsTextPage>},
 
     };
     return pages;
