@@ -29,21 +29,33 @@ private Q_SLOTS:
 
 void tst_InputFilters::keyEater()
 {
+    // Counts the key events that get past the eater (filters run newest first).
+    struct KeyCounter : QObject
+    {
+        int keys = 0;
+        bool eventFilter(QObject*, QEvent* inEvent) override
+        {
+            keys += inEvent->type() == QEvent::KeyPress || inEvent->type() == QEvent::KeyRelease;
+            return false;
+        }
+    } counter;
     QDialog dialog;
     auto* edit = new QLineEdit(&dialog);
+    dialog.installEventFilter(&counter);
     new ZuKeyEater(&dialog, Qt::Key_Escape);
     QSignalSpy rejected(&dialog, &QDialog::rejected);
     dialog.show();
     QTest::keyClick(edit, Qt::Key_Escape);
     QKeyEvent repeat(QEvent::KeyPress, Qt::Key_Escape, Qt::NoModifier, QString(), true);
-    QApplication::sendEvent(edit, &repeat);
-    QTest::keyClicks(edit, "ok");
-    QCOMPARE(edit->text(), QStringLiteral("ok"));
+    QApplication::sendEvent(&dialog, &repeat);
     QVERIFY(dialog.isVisible());
     QCOMPARE(rejected.count(), 0);
+    QCOMPARE(counter.keys, 0);
+    QTest::keyClick(&dialog, Qt::Key_A);
+    QCOMPARE(counter.keys, 2);
+    QTest::keyClicks(edit, "ok");
+    QCOMPARE(edit->text(), QStringLiteral("ok"));
     ZuKeyEater unattached(nullptr, Qt::Key_A); // watches nothing
-    QTest::keyClick(edit, Qt::Key_A);
-    QCOMPARE(edit->text(), QStringLiteral("oka"));
 }
 
 void tst_InputFilters::wheelSteps_data()
@@ -101,7 +113,7 @@ void tst_InputFilters::headerColumn_data()
     QTest::newRow("fixed dragged away") << 0 << 0 << 2 << QList<int>{0, 1, 2, 3} << 2;
     QTest::newRow("dropped onto fixed") << 0 << 3 << 0 << QList<int>{0, 1, 2, 3} << 2;
     QTest::newRow("elsewhere") << 0 << 1 << 3 << QList<int>{0, 2, 3, 1} << 1;
-    QTest::newRow("across, rightwards") << 2 << 0 << 3 << QList<int>{1, 3, 2, 0} << 2;
+    QTest::newRow("across, rightwards") << 1 << 0 << 3 << QList<int>{2, 1, 3, 0} << 2;
     QTest::newRow("across, leftwards") << 2 << 3 << 0 << QList<int>{3, 0, 2, 1} << 2;
 }
 

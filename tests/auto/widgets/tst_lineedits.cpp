@@ -23,7 +23,7 @@ class tst_LineEdits : public QObject
 private Q_SLOTS:
     void validate_data();
     void validate();
-    void keysInValidatedEdits();
+    void clampedWhenEditingEnds();
     void autoTrim_data();
     void autoTrim();
     void sizedToSampleOrText();
@@ -51,7 +51,7 @@ void tst_LineEdits::validate_data()
     row("int 25, Qt 5.15", range(1, 10), "25", 2, "1 25 2");
     row("int above", range(1, 10), "250", 3, "0 10 3");
     row("int below", range(1, 10), "-5", 2, "0 1 2");
-    row("int letters", range(1, 10), "x", 1, "0 x 1");
+    row("int letters", range(1, 10), "1a", 2, "0 1a 2");
     row("int bounds truncated", range(0.9, 10.7), "0", 1, "2 0 1");
     row("int top truncated", range(0.9, 10.7), "100", 3, "0 10 3");
     row("int bounds beyond int", range(-1e10, 1e10), "-7", 2, "2 -7 2");
@@ -88,7 +88,7 @@ void tst_LineEdits::validate()
     QTEST(QStringLiteral("%1 %2 %3").arg(state).arg(input).arg(pos), "result");
 }
 
-void tst_LineEdits::keysInValidatedEdits()
+void tst_LineEdits::clampedWhenEditingEnds()
 {
     QLineEdit number;
     number.setValidator(new ZuIntValidator(1, 10, &number));
@@ -98,15 +98,6 @@ void tst_LineEdits::keysInValidatedEdits()
     QTest::keyClick(&number, Qt::Key_Return);
     QCOMPARE(number.text(), QStringLiteral("10"));
     QCOMPARE(finished.count(), 1);
-
-    QLineEdit id(QStringLiteral("ID-42"));
-    id.setValidator(new ZuStartsWithStringValidator("ID-", &id));
-    QTest::keyClick(&id, Qt::Key_Home);
-    QTest::keyClicks(&id, "x");
-    QTest::keyClick(&id, Qt::Key_A, Qt::ControlModifier);
-    QTest::keyClick(&id, Qt::Key_Backspace);
-    QTest::keyClicks(&id, "7");
-    QCOMPARE(id.text(), QStringLiteral("ID-7"));
 }
 
 void tst_LineEdits::autoTrim_data()

@@ -246,6 +246,7 @@ ZuFindReplaceDialog::~ZuFindReplaceDialog()
 {
     // The marks cannot be taken off without the dialog.
     d->removeMarks();
+    disconnect(d->documentGone);
 }
 
 void ZuFindReplaceDialog::setDocument(QTextEdit* inEdit)

@@ -12,8 +12,9 @@ ZuHeaderColumnFixer::ZuHeaderColumnFixer(QHeaderView* inHeader, int inColumn)
     : QObject(inHeader), d(new Private)
 {
     d->column = inColumn;
-    connect(inHeader, SIGNAL(sectionMoved(int, int, int)), this,
-            SLOT(ensureColumnIsFix(int, int, int)));
+    if (inHeader)
+        connect(inHeader, SIGNAL(sectionMoved(int, int, int)), this,
+                SLOT(ensureColumnIsFix(int, int, int)));
 }
 
 ZuHeaderColumnFixer::~ZuHeaderColumnFixer() = default;
@@ -33,9 +34,10 @@ void ZuHeaderColumnFixer::ensureColumnIsFix(int logicalIndex, int oldVisualIndex
     } else if (newVisualIndex == fixed) {
         header->moveSection(fixed, oldVisualIndex);
     } else {
-        // Dragged across the column: that shifted it by one.
+        // Dragged across the column: that shifted it by one. (A column the header does not
+        // have is at -1, which moveSection() ignores.)
         const int shifted = header->visualIndex(fixed);
-        if (shifted >= 0 && shifted != fixed)
+        if (shifted != fixed)
             header->moveSection(shifted, fixed);
     }
 }

@@ -1,5 +1,6 @@
 #include "zubase/ZuIntValidator.h"
 
+#include <algorithm>
 #include <cmath>
 #include <limits>
 
@@ -11,13 +12,8 @@ int toIntBound(double inValue, int inOpenSide)
 {
     if (std::isnan(inValue))
         return inOpenSide;
-    constexpr int lowest = std::numeric_limits<int>::min();
-    constexpr int highest = std::numeric_limits<int>::max();
-    if (inValue <= lowest)
-        return lowest;
-    if (inValue >= highest)
-        return highest;
-    return static_cast<int>(inValue);
+    return static_cast<int>(std::clamp(inValue, double(std::numeric_limits<int>::min()),
+                                       double(std::numeric_limits<int>::max())));
 }
 
 } // namespace

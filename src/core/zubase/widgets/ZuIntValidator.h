@@ -15,7 +15,9 @@ public:
     ZuIntValidator(double inBottom, double inTop, QObject* inParent);
     ~ZuIntValidator() override;
 
-    // QIntValidator's answer; when it is Invalid, ioInput is also clamped by fixup().
+    // QIntValidator's answer; when it is Invalid, ioInput is also clamped by fixup(). On Qt
+    // 5.15 a number with no more digits than the top is Intermediate (25 for 1..10; Qt 5.5 said
+    // Invalid) and stays as typed; a QLineEdit clamps it through fixup() when editing ends.
     QValidator::State validate(QString& ioInput, int& ioPos) const override;
     // A base-10 integer is replaced by its value clamped to [bottom, top]; other text is kept.
     void fixup(QString& ioInput) const override;

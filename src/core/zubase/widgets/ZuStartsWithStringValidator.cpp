@@ -14,8 +14,7 @@ ZuStartsWithStringValidator::~ZuStartsWithStringValidator() = default;
 
 QValidator::State ZuStartsWithStringValidator::validate(QString& ioInput, int& ioPos) const
 {
-    if (ioPos < d->prefix.length())
-        ioPos = d->prefix.length();
+    ioPos = qMax(ioPos, d->prefix.length());
     if (ioInput.startsWith(d->prefix, Qt::CaseSensitive))
         return Acceptable;
     if (!ioInput.isEmpty())
