@@ -13,7 +13,7 @@
 #include "DemoWidgetsViewsPage.h"
 
 // Widgets IV
-
+#include "DemoWidgetsTextPage.h"
 
 #include <QLabel>
 #include <QPlainTextEdit>
@@ -62,6 +62,7 @@ const std::vector<DemoPage>& demoPages()
         {"widgets-views", "Tabs, views, dates", &make<DemoWidgetsViewsPage>},
 
         // Widgets IV
+        {"widgets-text", "Text and input", &make<DemoWidgetsTextPage>},
 
     };
     return pages;
