@@ -432,7 +432,7 @@ RkString getProcessStartupDirectory()
 {
     if (!processStartupDirectory().isEmpty())
         return processStartupDirectory();
-    ZuPlatform::Handle process = ZuPlatform::InvalidHandle;
+    ZuPlatform::Handle process = ZuPlatform::kInvalidHandle;
     std::string executable;
     if (ZuPlatform::openProcess(ZuPlatform::currentProcessId(), false, process) != 0)
         return RkString();
