@@ -14,6 +14,7 @@ private Q_SLOTS:
     void filter_data();
     void filter();
     void namesDuplicatesAndCopies();
+    void destroyedTree();
 };
 
 void tst_DicomNodeItems::keyboard()
@@ -101,6 +102,25 @@ void tst_DicomNodeItems::namesDuplicatesAndCopies()
     nodes.copySelectionFrom(other);
     QCOMPARE(nodes.selectedDicomNodes(), QStringList({"A", "B"}));
     QCOMPARE(other.selectedDicomNodes(), QStringList{"c"});
+}
+
+// The tree deletes its items: a list that outlives it must not read them.
+void tst_DicomNodeItems::destroyedTree()
+{
+    ZuDicomNodeItems nodes;
+    ZuDicomNodeItems survivor;
+    auto* tree = new QTreeWidget;
+    nodes.setTreeWidget(tree);
+    nodes.addDicomNode("CT1")->setCheckState(0, Qt::Checked);
+    QTreeWidget otherTree;
+    survivor.setTreeWidget(&otherTree);
+    survivor.addDicomNode("CT1");
+    delete tree;
+    QCOMPARE(nodes.selectedDicomNodes(), QStringList());
+    nodes.applyFilter("MR");
+    survivor.copySelectionFrom(nodes);
+    QCOMPARE(survivor.selectedDicomNodes(), QStringList());
+    nodes.copySelectionFrom(survivor);
 }
 
 QTEST_MAIN(tst_DicomNodeItems)

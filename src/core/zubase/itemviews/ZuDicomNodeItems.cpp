@@ -4,8 +4,6 @@
 #include <QSet>
 #include <QTreeWidget>
 
-template class QMap<QString, QTreeWidgetItem*>;
-
 ZuDicomNodeItems::ZuDicomNodeItems() = default;
 
 void ZuDicomNodeItems::setTreeWidget(QTreeWidget* inTree)
@@ -16,7 +14,7 @@ void ZuDicomNodeItems::setTreeWidget(QTreeWidget* inTree)
 QTreeWidgetItem* ZuDicomNodeItems::addDicomNode(const QString& inName)
 {
     auto* item = new QTreeWidgetItem(mTreeWidget.data());
-    mItems[inName] = item;
+    mItems[inName] = Node{item, mTreeWidget, !mTreeWidget.isNull()};
     item->setText(0, inName);
     item->setFlags((item->flags() & ~Qt::ItemIsSelectable) | Qt::ItemIsUserCheckable);
     // Set twice: a check state must be set once for the check box to show at all.
@@ -25,17 +23,27 @@ QTreeWidgetItem* ZuDicomNodeItems::addDicomNode(const QString& inName)
     return item;
 }
 
+QList<QPair<QString, QTreeWidgetItem*>> ZuDicomNodeItems::liveItems() const
+{
+    QList<QPair<QString, QTreeWidgetItem*>> items;
+    for (auto it = mItems.cbegin(); it != mItems.cend(); ++it) {
+        if (!it->inTree || it->tree)
+            items.append(qMakePair(it.key(), it->item));
+    }
+    return items;
+}
+
 void ZuDicomNodeItems::applyFilter(const QString& inFilter)
 {
     QSet<QTreeWidget*> trees;
     QTreeWidget* lastTree = nullptr;
-    for (auto it = mItems.cbegin(); it != mItems.cend(); ++it) {
-        QTreeWidgetItem* item = it.value();
+    for (const auto& entry : liveItems()) {
+        QTreeWidgetItem* item = entry.second;
         QTreeWidget* tree = item->treeWidget();
         if (!tree)
             continue;
-        const bool visible =
-            item->checkState(0) == Qt::Checked || it.key().contains(inFilter, Qt::CaseInsensitive);
+        const bool visible = item->checkState(0) == Qt::Checked ||
+                             entry.first.contains(inFilter, Qt::CaseInsensitive);
         item->setHidden(!visible);
         if (tree != lastTree) {
             trees.insert(tree);
@@ -63,18 +71,22 @@ void ZuDicomNodeItems::applyFilter(const QString& inFilter)
 QStringList ZuDicomNodeItems::selectedDicomNodes()
 {
     QStringList names;
-    for (auto it = mItems.cbegin(); it != mItems.cend(); ++it) {
-        if (it.value()->checkState(0) == Qt::Checked)
-            names << it.key();
+    for (const auto& entry : liveItems()) {
+        if (entry.second->checkState(0) == Qt::Checked)
+            names << entry.first;
     }
     return names;
 }
 
 void ZuDicomNodeItems::copySelectionFrom(const ZuDicomNodeItems& inOther)
 {
-    for (auto it = inOther.mItems.cbegin(); it != inOther.mItems.cend(); ++it) {
-        const auto mine = mItems.constFind(it.key());
-        if (mine != mItems.cend())
-            mine.value()->setCheckState(0, it.value()->checkState(0));
+    // Both lists are in name order: one pass over each.
+    const auto mine = liveItems();
+    int i = 0;
+    for (const auto& theirs : inOther.liveItems()) {
+        while (i < mine.size() && mine.at(i).first < theirs.first)
+            ++i;
+        if (i < mine.size() && mine.at(i).first == theirs.first)
+            mine.at(i).second->setCheckState(0, theirs.second->checkState(0));
     }
 }

@@ -2,7 +2,9 @@
 
 #include "zubase/zubase_export.h"
 
+#include <QList>
 #include <QMap>
+#include <QPair>
 #include <QPointer>
 #include <QString>
 #include <QStringList>
@@ -10,12 +12,11 @@
 class QTreeWidget;
 class QTreeWidgetItem;
 
-extern template class ZUBASE_EXPORT QMap<QString, QTreeWidgetItem*>;
-
 // The checkable DICOM node entries of a host's tree widget: one top-level item per node name,
 // a text filter that hides entries, and the names the user checked. A plain value: copies
-// refer to the same items. The tree and its items stay the host's; a host that deletes items
-// (or clears the tree) must drop this list with them.
+// refer to the same items. The tree and its items stay the host's: entries of a tree that has
+// been destroyed are left out, but a host that deletes single items (or clears a tree it
+// keeps) must drop this list with them.
 class ZUBASE_EXPORT ZuDicomNodeItems
 {
 public:
@@ -36,6 +37,15 @@ public:
     void copySelectionFrom(const ZuDicomNodeItems& inOther);
 
 private:
-    QMap<QString, QTreeWidgetItem*> mItems; // not owned
+    struct Node
+    {
+        QTreeWidgetItem* item = nullptr; // not owned
+        QPointer<QTreeWidget> tree;      // the tree that deletes the item
+        bool inTree = false;
+    };
+    // The entries whose items still exist: those of a destroyed tree went with it.
+    QList<QPair<QString, QTreeWidgetItem*>> liveItems() const;
+
+    QMap<QString, Node> mItems;
     QPointer<QTreeWidget> mTreeWidget;
 };
