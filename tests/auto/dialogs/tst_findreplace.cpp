@@ -82,12 +82,18 @@ class tst_FindReplace : public QObject
 {
     Q_OBJECT
 private Q_SLOTS:
-    // Enter in either field finds, F3 and Shift+F3 find on in the dialog and in the text edit,
-    // Escape closes; with nothing to find F3 opens the dialog.
+    // The parts side by side. Enter in either field finds, F3 and Shift+F3 find on in the dialog
+    // and in the text edit, Escape closes; with nothing to find F3 opens the dialog.
     void keys()
     {
         Fixture f("a b a b");
         QCOMPARE(f.dialog->windowTitle(), "Find and Replace");
+        const auto parts = f.dialog->findChildren<QWidget*>(QString(), Qt::FindDirectChildrenOnly);
+        QCOMPARE(parts.size(), 2 + 2 + 3 + 4);
+        for (QWidget* part : parts) {
+            for (QWidget* other : parts)
+                QVERIFY(part == other || !part->geometry().intersects(other->geometry()));
+        }
         QTest::keyClick(f.dialog, Qt::Key_P, Qt::AltModifier);
         QCOMPARE(QApplication::focusWidget(), f.replace);
         QTest::keyClick(f.replace, Qt::Key_Return); // nothing to find yet
