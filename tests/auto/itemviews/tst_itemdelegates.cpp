@@ -29,10 +29,10 @@ QFont cellFont(int inPixels = 13)
     return font;
 }
 
-QStyleOptionViewItem cellOption(int inWidth = 400, int inHeight = 24)
+QStyleOptionViewItem cellOption(int inWidth = 400)
 {
     QStyleOptionViewItem option;
-    option.rect = QRect(0, 0, inWidth, inHeight);
+    option.rect = QRect(0, 0, inWidth, 24);
     option.font = cellFont();
     option.fontMetrics = QFontMetrics(option.font);
     option.palette = QPalette(Qt::white);
@@ -167,20 +167,15 @@ private Q_SLOTS:
         QCOMPARE(inkOf(paintCell(delegate, neighbour)).x() < ink, measuringPixels > 0);
     }
 
-    // Lines stack, alignment holds, a cell that overflows is clipped to its text with
-    // clipping and without, and leaves the painter as it found it.
-    void layout()
+    // A cell that overflows is clipped to its text with clipping and without, and leaves the
+    // painter as it found it.
+    void overflow()
     {
         const QModelIndex cell = mModel.index(0, 1);
         mModel.setData(cell, "a\tH\nb\tH");
         ZuTabstopItemDelegate delegate;
         delegate.createIdentityProxyModel(&mModel);
         delegate.setTabPatternForColumn(1, "WWWW\tx");
-        QStyleOptionViewItem option = cellOption(400, 40);
-        QVERIFY(inkOf(paintCell(delegate, cell, option)).height() >
-                2 * QFontMetrics(cellFont()).capHeight());
-        option.displayAlignment = Qt::AlignRight | Qt::AlignVCenter;
-        QVERIFY(inkOf(paintCell(delegate, cell, option)).right() > 390);
 
         static QStringList sWarnings;
         const QtMessageHandler previous =
