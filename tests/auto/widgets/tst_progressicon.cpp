@@ -12,13 +12,18 @@
 
 namespace {
 
-// The grey of dot d of a spinner frame, read at the dot's centre (-1: not a grey).
-int greyOfDot(const QImage& inFrame, int inDot)
+// The greys of the dots of a spinner frame, read at their centres (-1: not a grey).
+QList<int> greys(const QSignalSpy& inFrames, int inIndex)
 {
-    const double angle = inDot * 3.14159 / 4, ratio = inFrame.devicePixelRatio();
-    const QRgb pixel = inFrame.pixel(qRound((12 + 8 * std::cos(angle)) * ratio - 0.5),
-                                     qRound((12 + 8 * std::sin(angle)) * ratio - 0.5));
-    return qRed(pixel) == qGreen(pixel) && qGreen(pixel) == qBlue(pixel) ? qRed(pixel) : -1;
+    const QImage frame = inFrames.at(inIndex).at(0).value<QPixmap>().toImage();
+    QList<int> list;
+    for (int dot = 0; dot < 8; ++dot) {
+        const double angle = dot * 3.14159 / 4, ratio = frame.devicePixelRatio();
+        const QRgb pixel = frame.pixel(qRound((12 + 8 * std::cos(angle)) * ratio - 0.5),
+                                       qRound((12 + 8 * std::sin(angle)) * ratio - 0.5));
+        list << (qRed(pixel) == qGreen(pixel) && qGreen(pixel) == qBlue(pixel) ? qRed(pixel) : -1);
+    }
+    return list;
 }
 
 // Event-loop wake-ups in 350 ms: one or two of the loop's own, three more of a 100 ms timer.
@@ -35,7 +40,8 @@ int wakeUps()
 }
 
 char sKeys[4]; // places of icons
-QString sLog;  // "<place>:<frame> " per setter call; the test frame n has red 20 n, -1: empty
+QString sLog;  // "<place>:<frame> " per setter call; the test frame n has red 20
+               // n, -1: empty
 
 std::function<void(const QIcon&)> logger(int inPlace)
 {
@@ -56,54 +62,41 @@ private Q_SLOTS:
     void init() { sLog.clear(); }
     void cleanup() { QHighDpiScaling::setGlobalFactor(1); }
 
-    // After 100 ms frame 1, after eight frame 0; at ratio 2 drawn anew, not enlarged.
-    void spinner_data()
-    {
-        QTest::addColumn<int>("ratio");
-        QTest::newRow("1") << 1;
-        QTest::newRow("2") << 2;
-    }
+    // After 100 ms frame 1, after eight frame 0, drawn at the screens' ratio as it is then;
+    // stopping keeps the place in the sequence. Busy while running.
     void spinner()
     {
-        QFETCH(int, ratio);
-        QHighDpiScaling::setGlobalFactor(ratio);
-        ZuProgressIcon icon;
-        QSignalSpy frames(&icon, &ZuProgressIcon::nextPixmap);
-        QElapsedTimer clock;
-        clock.start();
-        icon.start();
-        QTRY_COMPARE_WITH_TIMEOUT(frames.count(), 1, 2000);
-        QVERIFY(clock.elapsed() >= 90);
-        QTRY_COMPARE_WITH_TIMEOUT(frames.count(), 8, 3000);
-        const QImage first = frames.at(0).at(0).value<QPixmap>().toImage();
-        const QImage frame0 = frames.at(7).at(0).value<QPixmap>().toImage();
-        QCOMPARE(first.size(), QSize(24, 24) * ratio);
-        QCOMPARE(first.devicePixelRatio(), qreal(ratio));
-        QCOMPARE(greyOfDot(first, 1), 60);
-        QList<int> greys;
-        for (int dot = 0; dot < 8; ++dot)
-            greys << greyOfDot(frame0, dot);
-        QCOMPARE(greys, (QList<int>{60, 200, 200, 200, 200, 120, 100, 80}));
-        if (ratio == 2) {
-            const QImage small = QPixmap::fromImage(first).scaled(24, 24).toImage();
-            QVERIFY(first != small.scaled(48, 48));
-            QVERIFY(first != small.scaled(48, 48, Qt::IgnoreAspectRatio, Qt::SmoothTransformation));
+        for (int ratio : {2, 1}) {
+            QHighDpiScaling::setGlobalFactor(ratio);
+            ZuProgressIcon icon;
+            QSignalSpy frames(&icon, &ZuProgressIcon::nextPixmap);
+            QElapsedTimer clock;
+            clock.start();
+            icon.start();
+            QTRY_COMPARE_WITH_TIMEOUT(frames.count(), 1, 2000);
+            QVERIFY(clock.elapsed() >= 90);
+            QTRY_COMPARE_WITH_TIMEOUT(frames.count(), 8, 3000);
+            QCOMPARE(frames.at(0).at(0).value<QPixmap>().size(), QSize(24, 24) * ratio);
+            QCOMPARE(greys(frames, 0), (QList<int>{80, 60, 200, 200, 200, 200, 120, 100}));
+            QCOMPARE(greys(frames, 7), (QList<int>{60, 200, 200, 200, 200, 120, 100, 80}));
+            if (ratio == 2) { // drawn anew, not enlarged
+                const QImage first = frames.at(0).at(0).value<QPixmap>().toImage();
+                const QImage small = first.scaled(24, 24);
+                QVERIFY(first != small.scaled(48, 48));
+                QVERIFY(first !=
+                        small.scaled(48, 48, Qt::IgnoreAspectRatio, Qt::SmoothTransformation));
+            }
+            QAccessibleInterface* accessible = QAccessible::queryAccessibleInterface(&icon);
+            QVERIFY(accessible->role() == QAccessible::Animation && accessible->state().busy);
+            icon.stop();
+            QVERIFY(!accessible->state().busy);
+            QTest::qWait(250);
+            QHighDpiScaling::setGlobalFactor(3 - ratio);
+            icon.start();
+            QTRY_COMPARE_WITH_TIMEOUT(frames.count(), 9, 2000);
+            QCOMPARE(frames.at(8).at(0).value<QPixmap>().devicePixelRatio(), qreal(3 - ratio));
+            QCOMPARE(greys(frames, 8), greys(frames, 0));
         }
-
-        // Busy while running; stopping keeps the place in the sequence; frames
-        // follow a change of the screens' ratio.
-        QAccessibleInterface* accessible = QAccessible::queryAccessibleInterface(&icon);
-        QCOMPARE(accessible->role(), QAccessible::Animation);
-        QVERIFY(accessible->state().busy);
-        icon.stop();
-        QVERIFY(!accessible->state().busy);
-        QTest::qWait(250);
-        QHighDpiScaling::setGlobalFactor(3 - ratio);
-        icon.start();
-        QTRY_COMPARE_WITH_TIMEOUT(frames.count(), 9, 2000);
-        const QImage ninth = frames.at(8).at(0).value<QPixmap>().toImage();
-        QCOMPARE(ninth.devicePixelRatio(), qreal(3 - ratio));
-        QCOMPARE(greyOfDot(ninth, 1), 60);
     }
 
     // Without the host's images every place gets null icons, and nothing breaks.
@@ -116,8 +109,8 @@ private Q_SLOTS:
         Q_INIT_RESOURCE(progressframes);
     }
 
-    // Frames 1, 2, ... to every place in key order, the 13th is frame 1 again; unknown keys
-    // and replaced setters change nothing; the last removal stops the timer.
+    // Frames 1, 2, ... to every place in key order, the 13th is frame 1 again; unknown keys and
+    // replaced setters change nothing; the last removal stops the timer.
     void animatorFrames()
     {
         ZuAnimatedProgressIcon::setIconTo(sKeys + 1, logger(1));
@@ -126,7 +119,8 @@ private Q_SLOTS:
         QCOMPARE(sLog, "");                                  // not called at once
         ZuAnimatedProgressIcon::removeIconFrom(sKeys + 3);
         QTRY_COMPARE_WITH_TIMEOUT(sLog.count(' '), 26, 5000);
-        QCOMPARE(sLog, "0:1 1:1 0:2 1:2 0:3 1:3 0:4 1:4 0:5 1:5 0:6 1:6 0:7 1:7 0:8 1:8 0:9 1:9 "
+        QCOMPARE(sLog, "0:1 1:1 0:2 1:2 0:3 1:3 0:4 1:4 0:5 1:5 0:6 1:6 0:7 1:7 "
+                       "0:8 1:8 0:9 1:9 "
                        "0:10 1:10 0:11 1:11 0:0 1:0 0:1 1:1 ");
         const int busy = wakeUps();
         QVERIFY2(busy >= 4, qPrintable(QString::number(busy)));
@@ -134,9 +128,11 @@ private Q_SLOTS:
         ZuAnimatedProgressIcon::removeIconFrom(sKeys);
         ZuAnimatedProgressIcon::removeIconFrom(sKeys + 1);
         const int idle = wakeUps();
-        QVERIFY2(idle <= 2, qPrintable(QString::number(idle))); // the timer is stopped
+        QVERIFY2(idle <= 2,
+                 qPrintable(QString::number(idle))); // the timer is stopped
         ZuAnimatedProgressIcon::setIconTo(sKeys + 1, logger(1));
-        QTRY_COMPARE_WITH_TIMEOUT(sLog, "0:-1 1:-1 1:1 ", 2000); // a restart begins at frame 1
+        QTRY_COMPARE_WITH_TIMEOUT(sLog, "0:-1 1:-1 1:1 ",
+                                  2000); // a restart begins at frame 1
         ZuAnimatedProgressIcon::removeIconFrom(sKeys + 1);
     }
 
