@@ -8,6 +8,7 @@
 
 #include "rklib/RkDbC.h"
 
+#include <signal.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -355,21 +356,25 @@ void TestProcess::elevatedStart()
     QTest::qWait(150);
     QCOMPARE(spy.count(), 0); // an elevated child is not watched
     // The fixed id names no process, even where the system has one of that number.
-    QProcess holder;
-    for (int i = 0; i < 50 && holder.processId() != 4711; ++i) {
-        holder.kill();
-        holder.waitForFinished();
+    pid_t holder = 0;
+    for (int i = 0; i < 50 && holder != 4711; ++i) {
+        if (holder > 0 && ::kill(holder, SIGKILL) == 0)
+            ::waitpid(holder, nullptr, 0);
         QFile lastPid("/proc/sys/kernel/ns_last_pid"); // the next process gets 4711
         if (lastPid.open(QIODevice::WriteOnly))
             lastPid.write("4710");
         lastPid.close();
-        holder.start(helper("zu_sleep"), {"30000"});
-        QVERIFY(holder.waitForStarted());
+        holder = ::fork();
+        if (holder == 0) {
+            ::pause();
+            ::_exit(0);
+        }
     }
-    QVERIFY(!process.isRunning() && process.wait() == -1 && process.terminate(1).isBad());
-    QVERIFY(holder.state() == QProcess::Running && !holder.waitForFinished(100));
-    holder.kill();
-    holder.waitForFinished();
+    const bool untouched = !process.isRunning() && process.wait() == -1 &&
+                           process.terminate(1).isBad() && ::waitpid(holder, nullptr, WNOHANG) == 0;
+    ::kill(holder, SIGKILL);
+    ::waitpid(holder, nullptr, 0);
+    QVERIFY(untouched);
     QCOMPARE(failureLines(capture),
              QStringList({kWhere + "terminate: ::OpenProcess  cond[hProcess!=0]",
                           "last error 3: No such process"}));
