@@ -8,8 +8,7 @@
 
 #include "rklib/RkDbC.h"
 
-#include <cstdio>
-
+#include <signal.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -62,9 +61,15 @@ private Q_SLOTS:
     void zuProcessStandardStreams();
 
 private:
+    // A process of inExe with inArguments, not started yet.
+    void prepare(ZuBase::Process& ioProcess, const QString& inExe, const QStringList& inArguments)
+    {
+        ioProcess.mExePath = inExe;
+        ioProcess.mArguments = inArguments;
+    }
+    QString nextDumpPath() { return mTemp.filePath(QStringLiteral("dump%1").arg(++mDumpCount)); }
     QTemporaryDir mTemp;
     int mDumpCount = 0;
-    QString nextDumpPath() { return mTemp.filePath(QStringLiteral("dump%1").arg(++mDumpCount)); }
 };
 
 void TestProcess::initTestCase()
@@ -77,8 +82,7 @@ void TestProcess::logBlock()
 {
     RkLogCapture capture;
     ZuBase::Process process;
-    process.mExePath = QStringLiteral("/nonexistent/tzserver");
-    process.mArguments = QStringList{"a", "b"};
+    prepare(process, "/nonexistent/tzserver", {"a", "b"});
     process.mWorkingDirectory = QStringLiteral("/work dir");
     process.mEnvironment = QStringList{"A=1", "", "B=2"};
     QVERIFY(process.start(false, true, false).isBad());
@@ -94,8 +98,8 @@ void TestProcess::logBlock()
     process.mEnvironment.clear();
     QVERIFY(process.start(true, false, true).isBad());
     const QStringList lines = logLines(capture, "");
-    QCOMPARE(lines.value(0), QStringLiteral("<Process::start() elevate=1>"));
-    QCOMPARE(lines.value(2), QStringLiteral("    \"/nonexistent/tzserver\" "));
+    QVERIFY(lines.value(0) == "<Process::start() elevate=1>" &&
+            lines.value(2) == "    \"/nonexistent/tzserver\" ");
     QCOMPARE(lines.mid(7, 2), QStringList({"  <Environment inherit=0>", "  </Environment>"}));
 }
 
@@ -106,15 +110,14 @@ void TestProcess::startFailures_data()
     QTest::addColumn<QString>("tool"); // elevation tool; null: to start unelevated
     QTest::addColumn<QStringList>("failures");
 
-    const QString createProcess = kWhere + "start: ::CreateProcess  cond[b]";
     const QString shellExecute = kWhere + "start: ::ShellExecute  cond[int(hinst)>32]";
     const QString dump = helper("zu_dump");
     QTest::newRow("missing executable")
         << "/nonexistent/tzserver" << QString() << QString()
         << QStringList{kWhere + "start: Internal Error  cond[QFile::exists(mExePath)]"};
-    QTest::newRow("no such directory")
-        << dump << "/nonexistent/dir" << QString()
-        << QStringList{createProcess, "last error 2: No such file or directory"};
+    QTest::newRow("no such directory") << dump << "/nonexistent/dir" << QString()
+                                       << QStringList{kWhere + "start: ::CreateProcess  cond[b]",
+                                                      "last error 2: No such file or directory"};
     QTest::newRow("elevation declined")
         << dump << QString() << fakeElevationTool()
         << QStringList{shellExecute, "last error 13: Permission denied"};
@@ -122,6 +125,14 @@ void TestProcess::startFailures_data()
     QTest::newRow("no elevation tool")
         << dump << QString() << "/nonexistent/pkexec"
         << QStringList{shellExecute, "last error 2: No such file or directory"};
+    // A tool that cannot be run is no declined request.
+    const QString broken = mTemp.filePath("broken-pkexec");
+    QFile tool(broken);
+    QVERIFY(tool.open(QIODevice::WriteOnly) && tool.write("no program") > 0 &&
+            tool.setPermissions(tool.permissions() | QFile::ExeOwner));
+    QTest::newRow("elevation tool broken")
+        << dump << QString() << broken
+        << QStringList{shellExecute, "last error 8: Exec format error"};
 }
 
 void TestProcess::startFailures()
@@ -139,8 +150,7 @@ void TestProcess::startFailures()
     const QString dump = nextDumpPath();
     RkLogCapture capture;
     ZuBase::Process process;
-    process.mExePath = exe;
-    process.mArguments = QStringList{dump, "0"};
+    prepare(process, exe, {dump, "0"});
     process.mWorkingDirectory = directory;
     QSignalSpy spy(&process, &ZuBase::Process::terminated);
     const RkResult res = process.start(!tool.isNull(), true, false);
@@ -160,35 +170,25 @@ void TestProcess::childSeesItsStart_data()
     QTest::addColumn<QStringList>("arguments");
     QTest::addColumn<QStringList>("environment");
     QTest::addColumn<bool>("inherit");
-    QTest::addColumn<QString>("directory");
     QTest::addColumn<QByteArray>("key"); // what zu_dump reports
     QTest::addColumn<QStringList>("expected");
 
-    const auto args = [](const char* inName, const QStringList& inArguments,
-                         const QStringList& inReceived) {
-        QTest::newRow(inName) << inArguments << QStringList() << true << QString()
-                              << QByteArray("arg") << inReceived;
-    };
-    args("blank splits", {"two words"}, {"two", "words"});
-    args("caller quotes", {"\"two words\"", "x"}, {"two words", "x"});
-    args("backslashes plain", {"a\\\\b\\"}, {"a\\\\b\\"});
-    args("backslash before quote", {"\"c:\\dir\\\\\"", "next"}, {"c:\\dir\\", "next"});
-    args("doubled quote in quotes", {"\"a\"\"b\""}, {"a\"b"});
-
-    const auto env = [](const char* inName, const QStringList& inEntries, bool inInherit,
-                        const QStringList& inReceived) {
-        QTest::newRow(inName) << QStringList() << inEntries << inInherit << QString()
-                              << QByteArray("env") << inReceived;
-    };
-    env("empty environment", {}, false, {});
-    env("unusable entries dropped", {"", "=hidden", "NOEQUALS", "EMPTY=", "X=a=b"}, false,
-        {"EMPTY=", "X=a=b"});
+    QTest::newRow("blank splits") << QStringList{"two words"} << QStringList() << true
+                                  << QByteArray("arg") << QStringList{"two", "words"};
+    QTest::newRow("quotes and backslashes")
+        << QStringList{"\"c:\\dir\\\\\"", "a\\\\b\\", "\"a\"\"b\""} << QStringList() << true
+        << QByteArray("arg") << QStringList{"c:\\dir\\", "a\\\\b\\", "a\"b"};
+    QTest::newRow("empty environment")
+        << QStringList() << QStringList() << false << QByteArray("env") << QStringList();
+    QTest::newRow("unusable entries dropped")
+        << QStringList() << QStringList{"", "=hidden", "NOEQUALS", "EMPTY=", "X=a=b"} << false
+        << QByteArray("env") << QStringList{"EMPTY=", "X=a=b"};
     // Inherited: the parent's entries, none of the list.
-    env("inherit ignores the list", {"ONLY_IN_LIST=1"}, true, {"ZU_TEST_PARENT_MARK=present"});
-
-    QTest::newRow("given directory")
-        << QStringList() << QStringList() << true << mTemp.path() << QByteArray("cwd")
-        << QStringList{QFileInfo(mTemp.path()).canonicalFilePath()};
+    QTest::newRow("inherit ignores the list")
+        << QStringList() << QStringList{"ONLY_IN_LIST=1"} << true << QByteArray("env")
+        << QStringList{"ZU_TEST_PARENT_MARK=present"};
+    QTest::newRow("given directory") << QStringList() << QStringList() << true << QByteArray("cwd")
+                                     << QStringList{QFileInfo(mTemp.path()).canonicalFilePath()};
 }
 
 void TestProcess::childSeesItsStart()
@@ -196,17 +196,15 @@ void TestProcess::childSeesItsStart()
     QFETCH(QStringList, arguments);
     QFETCH(QStringList, environment);
     QFETCH(bool, inherit);
-    QFETCH(QString, directory);
     QFETCH(QByteArray, key);
     QFETCH(QStringList, expected);
 
     qputenv("ZU_TEST_PARENT_MARK", "present");
     const QString dump = nextDumpPath();
     ZuBase::Process process;
-    process.mExePath = helper("zu_dump");
-    process.mArguments = QStringList{dump, "5"} + arguments;
+    prepare(process, helper("zu_dump"), QStringList{dump, "5"} + arguments);
     process.mEnvironment = environment;
-    process.mWorkingDirectory = directory;
+    process.mWorkingDirectory = key == "cwd" ? mTemp.path() : QString();
     QVERIFY_OK(process.start(false, inherit, false));
     QVERIFY(process.wait() == 5 && process.exitCode() == 5);
     QCOMPARE(dumped(dump, "fds"), QStringList{"0:null 1:null 2:null "}); // no streams of ours
@@ -223,7 +221,6 @@ void TestProcess::suspendedThenEnds_data()
     QTest::addColumn<int>("code");
     QTest::addColumn<bool>("terminate");
     QTest::addColumn<bool>("resume");
-    QTest::newRow("exits 0") << 0 << false << true;
     QTest::newRow("exits 255") << 255 << false << true;
     QTest::newRow("terminated running") << 7 << true << true;
     QTest::newRow("terminated still suspended") << 1234 << true << false;
@@ -240,9 +237,8 @@ void TestProcess::suspendedThenEnds()
     RkLogCapture capture;
     const QString dump = nextDumpPath();
     ZuBase::Process process;
-    process.mExePath = helper(terminate ? "zu_sleep" : "zu_dump");
-    process.mArguments =
-        terminate ? QStringList{"30000"} : QStringList{dump, QString::number(code)};
+    prepare(process, helper(terminate ? "zu_sleep" : "zu_dump"),
+            terminate ? QStringList{"30000"} : QStringList{dump, QString::number(code)});
     QSignalSpy spy(&process, &ZuBase::Process::terminated);
     QVERIFY_OK(process.start(false, true, false));
     const unsigned pid = process.processId();
@@ -282,11 +278,9 @@ void TestProcess::listings()
 {
     // A child whose path is not ASCII, next to this process.
     const QString childExe = mTemp.filePath(QStringLiteral("schläfer ü/zu_sleep"));
-    QVERIFY(QDir().mkpath(QFileInfo(childExe).path()));
-    QVERIFY(QFile::copy(helper("zu_sleep"), childExe));
+    QVERIFY(QDir().mkpath(QFileInfo(childExe).path()) && QFile::copy(helper("zu_sleep"), childExe));
     ZuBase::Process child;
-    child.mExePath = childExe;
-    child.mArguments = QStringList{"30000"};
+    prepare(child, childExe, {"30000"});
     QVERIFY_OK(child.start(false, true, false));
     child.resume();
 
@@ -311,8 +305,7 @@ void TestProcess::listings()
     QStringList modules;
     QTRY_VERIFY(listedChild->modules(modules).isOk() && modules.value(0) == childExe);
     QString image;
-    QVERIFY_OK(listedChild->imageFilePath(image));
-    QCOMPARE(image, childExe);
+    QVERIFY(listedChild->imageFilePath(image).isOk() && image == childExe);
     const QSharedPointer<ZuBase::Process> self = ZuBase::Process::self();
     QVERIFY(self->processId() == unsigned(getpid()) && self->isRunning()); // not our child
     QVERIFY_OK(self->modules(modules));
@@ -334,8 +327,8 @@ void TestProcess::listings()
     QVERIFY(std::any_of(map.begin(), map.end(), [](const auto& inProcess) {
         return inProcess->processId() == unsigned(getpid());
     }));
-    QCOMPARE(map.values(childExe.toLower()).size(), 1);
-    QCOMPARE(map.value(childExe.toLower())->processId(), child.processId());
+    const auto byChild = map.values(childExe.toLower());
+    QVERIFY(byChild.size() == 1 && byChild.first()->processId() == child.processId());
 
     // A listed process is watched like any other: its end is seen.
     QVERIFY_OK(listedChild->terminate(3));
@@ -354,8 +347,7 @@ void TestProcess::elevatedStart()
     const QString dump = nextDumpPath();
     RkLogCapture capture;
     ZuBase::Process process;
-    process.mExePath = helper("zu_dump");
-    process.mArguments = QStringList{dump, "0", "two words"};
+    prepare(process, helper("zu_dump"), {dump, "0", "two words"});
     QSignalSpy spy(&process, &ZuBase::Process::terminated);
     QVERIFY_OK(process.start(true, true, false));
     QCOMPARE(process.processId(), 4711u);
@@ -364,7 +356,25 @@ void TestProcess::elevatedStart()
     QTest::qWait(150);
     QCOMPARE(spy.count(), 0); // an elevated child is not watched
     // The fixed id names no process, even where the system has one of that number.
-    QVERIFY(!process.isRunning() && process.wait() == -1 && process.terminate(1).isBad());
+    pid_t holder = 0;
+    for (int i = 0; i < 50 && holder != 4711; ++i) {
+        if (holder > 0 && ::kill(holder, SIGKILL) == 0)
+            ::waitpid(holder, nullptr, 0);
+        QFile lastPid("/proc/sys/kernel/ns_last_pid"); // the next process gets 4711
+        if (lastPid.open(QIODevice::WriteOnly))
+            lastPid.write("4710");
+        lastPid.close();
+        holder = ::fork();
+        if (holder == 0) {
+            ::pause();
+            ::_exit(0);
+        }
+    }
+    const bool untouched = !process.isRunning() && process.wait() == -1 &&
+                           process.terminate(1).isBad() && ::waitpid(holder, nullptr, WNOHANG) == 0;
+    ::kill(holder, SIGKILL);
+    ::waitpid(holder, nullptr, 0);
+    QVERIFY(untouched);
     QCOMPARE(failureLines(capture),
              QStringList({kWhere + "terminate: ::OpenProcess  cond[hProcess!=0]",
                           "last error 3: No such process"}));
@@ -375,8 +385,7 @@ void TestProcess::elevatedStart()
         mTemp.filePath(QFileInfo(QCoreApplication::applicationFilePath()).fileName());
     QVERIFY(QFile::copy(helper("zu_sleep"), self));
     capture.clear();
-    process.mExePath = self;
-    process.mArguments = QStringList{"3000", "126"};
+    prepare(process, self, {"3000", "126"});
     QElapsedTimer timer;
     timer.start();
     QVERIFY_OK(process.start(true, true, false));
@@ -404,8 +413,7 @@ void TestProcess::startsTheCheckedFile()
     qputenv("PATH", onPath.path().toLocal8Bit());
     const QString dump = nextDumpPath();
     ZuBase::Process process;
-    process.mExePath = QStringLiteral("zuprog");
-    process.mArguments = QStringList{dump, "0"};
+    prepare(process, "zuprog", {dump, "0"});
     const RkResult res = process.start(elevate, true, false);
     QDir::setCurrent(previous);
     qputenv("PATH", oldPath);
@@ -417,24 +425,10 @@ void TestProcess::startsTheCheckedFile()
 
 void TestProcess::elevationInformation()
 {
-    // userIsAdmin() prints its line on the first call only: catch standard output.
-    std::fflush(stdout);
-    const int saved = dup(STDOUT_FILENO);
-    QFile out(mTemp.filePath("stdout"));
-    QVERIFY(out.open(QIODevice::WriteOnly));
-    dup2(out.handle(), STDOUT_FILENO);
-    const bool admin = ZuBase::Process::userIsAdmin();
-    const bool again = ZuBase::Process::userIsAdmin();
-    dup2(saved, STDOUT_FILENO);
-    close(saved);
-    out.close();
-
-    const bool elevated = ZuBase::Process::elevated();
-    QVERIFY(elevated == (geteuid() == 0) && ZuBase::Process::elevated() == elevated);
-    QVERIFY(again == admin && (admin || !elevated));
-    QVERIFY(out.open(QIODevice::ReadOnly));
-    QCOMPARE(out.readAll(),
-             QString("\nelevationInfo() elev %1  admin %2\n").arg(elevated).arg(admin).toLatin1());
+    // Root is elevated and an administrator; the answers are kept.
+    const bool elevated = ZuBase::Process::elevated(), admin = ZuBase::Process::userIsAdmin();
+    QVERIFY(elevated == (geteuid() == 0) && (admin || !elevated));
+    QVERIFY(ZuBase::Process::elevated() == elevated && ZuBase::Process::userIsAdmin() == admin);
 }
 
 void TestProcess::exitWithAndWithoutCallback()
@@ -460,7 +454,6 @@ void TestProcess::exitWithAndWithoutCallback()
 
     // Without one, the process ends with the code.
     const pid_t pid = fork();
-    QVERIFY(pid >= 0);
     if (pid == 0) {
         ZuBase::Process::exit(9, QString());
         _exit(1); // not reached when exit() ends the process
