@@ -153,7 +153,9 @@ void tst_CollapsibleWidget::contentAndHeaderWidgets()
     QVERIFY(!first->isHidden()); // taken out of the layout only
     delete first;
     delete widget.contentWidget();
-    QVERIFY(!widget.contentWidget());
+    QVERIFY(!widget.contentWidget()); // measured as without content
+    widget.setExpanded(true);
+    QCOMPARE(widget.maximumHeight(), headerHeight(widget));
 
     // Content indented by expanderButtonIndent() lines up with the title; the header widget
     // follows the title.
