@@ -6,6 +6,7 @@
 #include <QAction>
 #include <QDialog>
 #include <QElapsedTimer>
+#include <QLayout>
 #include <QLineEdit>
 #include <QPushButton>
 
@@ -54,6 +55,8 @@ void tst_QuickSearchWidget::reporting()
              QStringLiteral("Search filter"));
     QCOMPARE(edit->placeholderText(), QStringLiteral("Enter Search Filter"));
     QCOMPARE(clear->text(), QStringLiteral("Clear"));
+    search->layout()->activate();
+    QVERIFY(edit->geometry().right() < clear->x()); // side by side
 
     search->setSearchDelay(100);
     QTest::keyClick(edit, Qt::Key_X);
