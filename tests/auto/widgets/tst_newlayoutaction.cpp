@@ -1,5 +1,4 @@
-// ZuNewLayoutAction and its grid as a user drives them: pointing, clicking, the keys in a menu,
-// the caption a screen reader reads, the cells painted.
+// ZuNewLayoutAction's grid: pointing, clicking, the keys in a menu, the caption, the cells painted.
 #include "zubase/ZuNewLayoutAction.h"
 
 #include <QAccessible>
@@ -32,14 +31,12 @@ void tst_NewLayoutAction::pointing_data()
     QTest::addColumn<Points>("moves"); // y from the top of the grid, below the caption
     QTest::addColumn<QSize>("layout");
 
-    QTest::newRow("fresh") << 1 << Points() << QSize(1, 1);
     QTest::newRow("4 x 2") << 1 << Points{{3 * 34 + 5, 34 + 5}} << QSize(4, 2);
     QTest::newRow("x 33, above the grid") << 1 << Points{{33, -40}} << QSize(1, 1);
     QTest::newRow("x 34") << 1 << Points{{34, 0}} << QSize(2, 1);
     QTest::newRow("no upper clamp") << 1 << Points{{400, 300}} << QSize(12, 9);
     QTest::newRow("step 0 is 1") << 0 << Points{{40, 40}} << QSize(2, 2);
     QTest::newRow("step 3 starts at 3") << 3 << Points() << QSize(3, 1);
-    QTest::newRow("step 3, column 5 keeps 3") << 3 << Points{{4 * 34 + 5, 0}} << QSize(3, 1);
     QTest::newRow("step 3, column 6") << 3 << Points{{5 * 34 + 5, 0}} << QSize(6, 1);
     QTest::newRow("step 3, far left") << 3 << Points{{5 * 34, 0}, {-40, 0}} << QSize(3, 1);
 }
@@ -49,7 +46,6 @@ void tst_NewLayoutAction::pointing()
     QFETCH(int, step);
     QFETCH(Points, moves);
     QFETCH(QSize, layout);
-
     ZuNewLayoutAction action(nullptr, step);
     QWidget* grid = action.defaultWidget();
     const int header = QFontMetrics(grid->font()).height() + 16;
@@ -79,13 +75,10 @@ void tst_NewLayoutAction::pointing()
     QCOMPARE(cell(column, row), highlight);
     QVERIFY(layout.width() > 9 || cell(column + 1, row) != highlight);
     QVERIFY(layout.height() > 4 || cell(column, row + 1) != highlight);
-    // An unselected cell is outlined in the text colour, all four edges.
-    const QColor ink = grid->palette().color(QPalette::WindowText);
-    const QPoint last(2 + 34 * 9, header + 2 + 34 * 4);
-    if (layout.width() < 10) {
-        for (const QPoint& edge : {QPoint(15, 0), QPoint(29, 15), QPoint(15, 29), QPoint(0, 15)})
-            QCOMPARE(image.pixelColor(last + edge), ink);
-    }
+    // An unselected cell is outlined in the text colour.
+    if (layout.width() < 10)
+        QCOMPARE(image.pixelColor(2 + 34 * 9 + 15, header + 2 + 34 * 4),
+                 grid->palette().color(QPalette::WindowText));
 }
 
 void tst_NewLayoutAction::keysInMenu()
