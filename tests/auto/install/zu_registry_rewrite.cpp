@@ -1,12 +1,11 @@
 // Starts an installation and lists its other versions with a file-size limit, as on a full
 // disk: zu_registry_rewrite <application folder> <limit in bytes> <own protocol version>.
-// Prints "<version> <folder>" per other version; the log goes to standard error.
+// The log goes to standard error.
 #include "zubase/PnResource.h"
 
 #include <QCoreApplication>
 
 #include <csignal>
-#include <cstdio>
 #include <cstdlib>
 #include <sys/resource.h>
 
@@ -24,7 +23,5 @@ int main(int argc, char** argv)
     PnResource::initialize(argv[1], nullptr);
     std::map<RkVersion, std::string> versions;
     PnResource::getOtherVersions(versions, RkVersion(argv[3]));
-    for (const auto& [version, folder] : versions)
-        std::printf("%s %s\n", version.toString().c_str(), folder.c_str());
     return 0;
 }

@@ -7,11 +7,7 @@
 
 Q_DECLARE_METATYPE(QtMsgType)
 
-namespace {
-
-QStringList sCallbackTexts;
-
-} // namespace
+static QStringList sCallbackTexts;
 
 class TestConvert : public QObject
 {
@@ -41,27 +37,22 @@ private Q_SLOTS:
     void expandEnvironmentVariables_data()
     {
         qputenv("ZU_A", "alpha");
-        qputenv("ZU_NESTED", "%ZU_A%/x");
-        qputenv("ZU_SELF", "%ZU_SELF%");
         qputenv("ZU_GROW", "%ZU_GROW%x");
         qputenv("ZU_PERCENT", "50%");
         qunsetenv("ZU_UNSET");
         QTest::addColumn<QString>("text");
         QTest::addColumn<QString>("expected");
-        auto row = [](const char* inName, const char* inText, const QString& inExpected) {
-            QTest::newRow(inName) << QString(inText) << inExpected;
-        };
-        row("unset", "%ZU_UNSET%/x", "/x");
-        row("both forms", "%ZU_A% ${ZU_A}/bin", "alpha alpha/bin");
-        row("value expanded in turn", "%ZU_NESTED%", "alpha/x");
-        row("lone percent stops all", "50% of ${HOME}", "50% of ${HOME}");
-        row("unterminated after one", "%ZU_A%%ZU_A", "alpha%ZU_A");
-        // The text is rescanned from its start: a "%" of a value pairs with the next one.
-        row("percent in value", "%ZU_PERCENT%ZU_A%", "50alpha");
-        // Bounded: a self-reference stays, a growing one stops after the last replacement.
-        row("self reference", "%ZU_SELF%", "%ZU_SELF%");
-        row("growing reference", "%ZU_GROW%",
-            "%ZU_GROW%" + QString(Zu::kMaxEnvironmentReplacements, 'x'));
+        // clang-format off
+        QTest::newRow("unset") << "%ZU_UNSET%/x" << "/x";
+        QTest::newRow("both forms") << "%ZU_A% ${ZU_A}/bin" << "alpha alpha/bin";
+        QTest::newRow("lone percent stops all") << "50% of ${HOME}" << "50% of ${HOME}";
+        QTest::newRow("unterminated after one") << "%ZU_A%%ZU_A" << "alpha%ZU_A";
+        // Values are expanded in turn: the text is rescanned from its start, so a "%" of a value
+        // pairs with the next one.
+        QTest::newRow("percent in value") << "%ZU_PERCENT%ZU_A%" << "50alpha";
+        // Bounded: a self-reference stops after the last replacement.
+        QTest::newRow("growing reference") << "%ZU_GROW%" << "%ZU_GROW%" + QString(Zu::kMaxEnvironmentReplacements, 'x');
+        // clang-format on
     }
     void expandEnvironmentVariables()
     {
@@ -71,28 +62,26 @@ private Q_SLOTS:
 
     void replaceFillersAndCase()
     {
-        QCOMPARE(Zu::replaceFillers("__a__b_", "_", ' '), QStringLiteral("a b"));
         QCOMPARE(Zu::replaceFillers("-a_-_b..c.", "-_", '.'), QStringLiteral("a.b.c"));
         // const char* is Latin-1 (0xC4 is 'Ä'); the comparison ignores case, also beyond ASCII.
         QVERIFY(ZuStringCaseInsensitive("\xC4rger") == QString::fromUtf8("äRGER"));
         QVERIFY(!(ZuStringCaseInsensitive("abc") == QStringLiteral("abd")));
-        ZuStringCaseInsensitive text;
-        QCOMPARE(text = "\xE9t\xE9", QString::fromUtf8("été"));
-        QCOMPARE(text = QStringLiteral("ABC"), QStringLiteral("ABC")); // kept as given
     }
 
+    // Written to the log at its level; levels 0 to 2 are hidden from the write callback, for that
+    // one message only.
     void messageHandler_data()
     {
         QTest::addColumn<QtMsgType>("type");
         QTest::addColumn<QByteArray>("category"); // null: no category
-        QTest::addColumn<int>("level"); // levels 0 to 2 are hidden from the write callback
+        QTest::addColumn<int>("level");
         QTest::addColumn<QString>("logged");
+        // clang-format off
         QTest::newRow("debug") << QtDebugMsg << QByteArray("zu.test") << 0 << "zu.test: 1% %s";
         QTest::newRow("warning") << QtWarningMsg << QByteArray("default") << 2 << "default: 1% %s";
-        QTest::newRow("critical, empty category")
-            << QtCriticalMsg << QByteArray("") << 3 << "1% %s";
-        QTest::newRow("fatal") << QtFatalMsg << QByteArray("zu") << 4 << "zu: 1% %s";
+        QTest::newRow("fatal, empty category") << QtFatalMsg << QByteArray("") << 4 << "1% %s";
         QTest::newRow("unknown type") << QtMsgType(7) << QByteArray() << 3 << "1% %s";
+        // clang-format on
     }
     void messageHandler()
     {
@@ -107,14 +96,11 @@ private Q_SLOTS:
         RkLogCapture capture;
         QMessageLogContext context("f.cpp", 1, "f()",
                                    category.isNull() ? nullptr : category.data());
-        ZuBase::logQtMessageToRkLogFile(type, context, QStringLiteral("1% %s"));
-        // The hiding was for one message only.
+        ZuBase::logQtMessageToRkLogFile(type, context, "1% %s");
         getTheLogInstance().tracef(RkLogError, "Qt", "after");
         getTheLogInstance().setWriteCallback(nullptr, RkLogOff);
-
         QCOMPARE(TestSupport::logLines(capture, "Qt"), QStringList({logged, "after"}));
-        QVERIFY(TestSupport::logLines(capture, "Qt", RkLogLevel(level)).contains(logged));
-        QVERIFY(!TestSupport::logLines(capture, "Qt", RkLogLevel(level + 1)).contains(logged));
+        QCOMPARE(int(capture.entries().front().level), level);
         QCOMPARE(sCallbackTexts, level > 2 ? QStringList({logged, "after"}) : QStringList("after"));
     }
 };
