@@ -104,6 +104,7 @@ class TestApplication : public QObject
     Q_OBJECT
 private Q_SLOTS:
     void initTestCase();
+    void cleanupTestCase() { getTheLogInstance().removeSink(mReportSink); }
     void mainThreadAndDepth();
     void environment();
     void hooks();
@@ -126,11 +127,12 @@ private:
     int mAboutShown = 0;
     // Every "DeferredDelete" report of the process: the cap counts them all.
     std::atomic<int> mReports{0};
+    int mReportSink = -1;
 };
 
 void TestApplication::initTestCase()
 {
-    getTheLogInstance().addSink(
+    mReportSink = getTheLogInstance().addSink(
         [this](const RkLogEntry& inEntry) { mReports += inEntry.category == "DeferredDelete"; });
 }
 
