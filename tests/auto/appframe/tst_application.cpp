@@ -327,6 +327,7 @@ void TestApplication::protocolHandler()
     const bool missing = arguments == QStringList("missing");
     if (!QFileInfo::exists(program)) // a run stopped before it could put it back
         QFile::rename(program + ".away", program);
+    QFile::remove(program + ".away"); // and a rebuild put a new one in its place
     QVERIFY(!missing || QFile::rename(program, program + ".away"));
     const auto restore = qScopeGuard([&] { missing&& QFile::rename(program + ".away", program); });
     struct ProcessWatch : ZuApplication::HookNotify
