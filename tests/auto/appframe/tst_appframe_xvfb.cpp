@@ -6,7 +6,6 @@
 #include "zubase/ZuMessageBox.h"
 
 #include <QLayout>
-#include <QScreen>
 #include <QX11Info>
 #include <QtTest>
 
@@ -27,7 +26,6 @@ void TestAppFrameXvfb::screens()
 {
     // Separate X screens each start at the origin of their own coordinates; the sort keeps the
     // screens' order for equal positions.
-    QVERIFY(QX11Info::isPlatformX11());
     qunsetenv("TESSEL_MONITORS");
     std::vector<ZuDesktop::DisplayInfo> displays;
     bool fromEnvironment = true;
@@ -55,7 +53,6 @@ void TestAppFrameXvfb::mouseButtons2()
         XWarpPointer(display, 0, RootWindow(display, screen), 0, 0, 0, 0, 100, 100);
         // Each step: buttons to press or release (negative), then the state expected.
         const QList<QPair<QList<int>, Qt::MouseButtons>> steps = {
-            {{}, Qt::NoButton},
             {{1, 3}, Qt::LeftButton | Qt::RightButton},
             {{-1, 2}, Qt::MiddleButton | Qt::RightButton},
             {{-2, -3}, Qt::NoButton}};
