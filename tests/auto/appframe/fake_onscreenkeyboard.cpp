@@ -1,7 +1,6 @@
-// Stands in for the on-screen keyboard program. Appends its pid to $FAKE_KEYBOARD_LOG when it
-// starts; with $FAKE_KEYBOARD_WINDOW "normal" or "iconic" it also shows a window carrying
-// _NET_WM_PID (iconic: marked minimised as a window manager would) and then appends
-// "window <pid>". Runs until killed, at most two minutes, and dies with its parent.
+// Stands in for the keyboard program: appends its pid to $FAKE_KEYBOARD_LOG; with
+// $FAKE_KEYBOARD_WINDOW "normal" or "iconic" it shows a window carrying _NET_WM_PID (iconic:
+// marked minimised as a window manager would) and appends "window <pid>". Runs until killed.
 #include <X11/Xatom.h>
 #include <X11/Xlib.h>
 
@@ -15,12 +14,8 @@
 
 static void note(const char* inText)
 {
-    if (const char* path = std::getenv("FAKE_KEYBOARD_LOG")) {
-        if (FILE* file = std::fopen(path, "a")) {
-            std::fprintf(file, "%s%d\n", inText, static_cast<int>(getpid()));
-            std::fclose(file);
-        }
-    }
+    if (FILE* file = std::fopen(std::getenv("FAKE_KEYBOARD_LOG"), "a"))
+        std::fprintf(file, "%s%d\n", inText, int(getpid())), std::fclose(file);
 }
 
 int main()
@@ -29,15 +24,13 @@ int main()
     alarm(120);
     note("");
     const char* mode = std::getenv("FAKE_KEYBOARD_WINDOW");
-    Display* display = mode ? XOpenDisplay(nullptr) : nullptr;
-    if (display) {
+    if (Display* display = mode ? XOpenDisplay(nullptr) : nullptr) {
         const Window window =
-            XCreateSimpleWindow(display, DefaultRootWindow(display), 0, 0, 200, 100, 0, 0, 0);
-        const long pid = getpid();
+            XCreateSimpleWindow(display, DefaultRootWindow(display), 0, 0, 99, 99, 0, 0, 0);
+        const long pid = getpid(), state[2] = {std::strcmp(mode, "iconic") ? 1L : 3L, 0L};
+        const Atom wmState = XInternAtom(display, "WM_STATE", False);
         XChangeProperty(display, window, XInternAtom(display, "_NET_WM_PID", False), XA_CARDINAL,
                         32, PropModeReplace, reinterpret_cast<const unsigned char*>(&pid), 1);
-        const Atom wmState = XInternAtom(display, "WM_STATE", False);
-        const long state[2] = {std::strcmp(mode, "iconic") == 0 ? 3L : 1L, 0L};
         XChangeProperty(display, window, wmState, wmState, 32, PropModeReplace,
                         reinterpret_cast<const unsigned char*>(state), 2);
         XMapWindow(display, window);
