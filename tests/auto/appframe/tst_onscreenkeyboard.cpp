@@ -125,11 +125,17 @@ private Q_SLOTS:
         QFETCH(QString, kind);
         QFETCH(QString, mode);
         QFETCH(bool, starts);
-        std::unique_ptr<QWidget> widget(kind == "text edit"  ? static_cast<QWidget*>(new QTextEdit)
-                                        : kind == "spin box" ? new QSpinBox
-                                        : kind == "button"   ? new QPushButton
-                                        : kind.endsWith("combo") ? new QComboBox
-                                                                 : new QLineEdit);
+        std::unique_ptr<QWidget> widget;
+        if (kind == "text edit")
+            widget.reset(new QTextEdit);
+        else if (kind == "spin box")
+            widget.reset(new QSpinBox);
+        else if (kind == "button")
+            widget.reset(new QPushButton);
+        else if (kind.endsWith("combo"))
+            widget.reset(new QComboBox);
+        else
+            widget.reset(new QLineEdit);
         if (auto* combo = qobject_cast<QComboBox*>(widget.get()))
             combo->setEditable(kind == "editable combo");
         if (kind == "opted out")
