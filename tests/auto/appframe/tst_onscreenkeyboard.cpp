@@ -3,6 +3,7 @@
 #include "zubase/PnResource.h"
 #include "zubase/ZuOnScreenKeyboard.h"
 #include "zubase/ZuPopupMenuComboBox.h"
+#include "zubase/platform/SysProcess.h"
 
 #include <QApplication>
 #include <QComboBox>
@@ -168,6 +169,7 @@ private Q_SLOTS:
                                                     "ZuOnScreenKeyboard - terminating process\n",
                                                     "ZuOnScreenKeyboard - success\n"}));
         QTRY_VERIFY(!alive(started().first()));
+        QTRY_COMPARE(ZuPlatform::childrenTracked(), std::size_t(0)); // its handle is closed
         // Ended from outside: the next focus starts a new one.
         keyboard.focusIn(&first);
         QTRY_COMPARE(started().size(), 2);
@@ -229,7 +231,12 @@ private Q_SLOTS:
         keyboard.focusIn(qApp, QEvent::ApplicationDeactivate);
         QTRY_COMPARE(QGuiApplication::focusWindow(), first.windowHandle());
         QCOMPARE(QApplication::focusWidget(), combo);
+        // Both are forgotten once given back.
+        second.activateWindow();
+        QVERIFY(QTest::qWaitForWindowActive(&second));
         keyboard.activateWindow();
+        QTest::qWait(50);
+        QCOMPARE(QGuiApplication::focusWindow(), second.windowHandle());
         QCOMPARE(editing.size(), 1);
         // The input may be gone by then.
         keyboard.focusIn(combo);
