@@ -22,6 +22,7 @@ class tst_Download : public QObject
     QTemporaryDir mDir;
     QString mTarget;
     QList<QPair<QString, ZuDownload::Result>> mCalls;
+    bool mDialogAtEnd = false; // a progress dialog existed when finished() came
 
     // Runs one download to its end; mCalls holds what it reported.
     void run(ZuDownload& ioDownload, const QString& inPath, int inTimeout = 0)
@@ -51,6 +52,9 @@ private Q_SLOTS:
     void onFinished(const QString& inPath, ZuDownload::Result inResult)
     {
         mCalls << qMakePair(inPath, inResult);
+        mDialogAtEnd = false;
+        for (QWidget* widget : QApplication::allWidgets())
+            mDialogAtEnd = mDialogAtEnd || qobject_cast<ZuProgressDialog*>(widget);
     }
 
     void initTestCase()
@@ -117,6 +121,7 @@ private Q_SLOTS:
         QCOMPARE(mCalls[0].first, result == ZuDownload::NetworkError ? "/file?" + query : mTarget);
         QTEST(methods(), "requests");
         QCOMPARE(files(), QStringList("target.bin"));
+        QVERIFY(!mDialogAtEnd); // none asked for
         QVERIFY(old.open(QIODevice::ReadOnly));
         if (after < 0)
             QCOMPARE(old.size(), before); // the old file stays as it was
@@ -218,6 +223,7 @@ private Q_SLOTS:
         QTRY_COMPARE(dialog->value(), 25000);
         QCOMPARE(dialog->maximum(), int(3000000000LL >> 1));
         QTRY_COMPARE(mCalls.size(), 1);
+        QVERIFY(mDialogAtEnd);
         QTRY_VERIFY(dialog.isNull()); // closed and gone at the end
 
         // The dialog's parent dies while the HEAD request is out: one report, no dialog.
