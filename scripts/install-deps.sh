@@ -8,7 +8,7 @@ packages=(
     qtbase5-dev qtbase5-private-dev qt5-style-plugins libqt5x11extras5-dev libx11-dev
     libpam0g-dev libpam-modules libpam-runtime libcap-dev zlib1g-dev
     xvfb xauth libxtst6 socat python3 passwd fonts-dejavu-core
-    e2fsprogs mount
+    e2fsprogs mount openssl curl
 )
 
 missing=()
