@@ -11,8 +11,8 @@ public:
     // Held as plain objects: a child announcing its destruction is no longer a QCheckBox,
     // so it must be found without casting.
     QList<QPointer<QObject>> children; // in the order added, duplicates kept
-    QList<bool> recordedStates;          // index for index with the children
-    bool updating = false;               // the group itself is changing check states
+    QList<bool> recordedStates;        // index for index with the children
+    bool updating = false;             // the group itself is changing check states
 
     // A destroyed child must not stay listed: the next click of the parent would reach it.
     void dropChild(QObject* inDestroyed)
