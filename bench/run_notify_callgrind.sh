@@ -7,25 +7,10 @@ set -eu
 BUILD_DIR=${1:-build}
 EVENTS=${2:-1000000}
 BENCH="$BUILD_DIR/bench/bench_notify"
-[ -x "$BENCH" ] || { echo "no $BENCH; build the target bench_notify first" >&2; exit 2; }
-command -v valgrind >/dev/null || { echo "valgrind is not installed" >&2; exit 2; }
-export QT_QPA_PLATFORM=offscreen
-WORK=$(mktemp -d)
-trap 'rm -rf "$WORK"' EXIT
+COUNT=$EVENTS
+. "$(dirname "$0")/callgrind_common.sh"
 
-# Total instructions of one run (the "totals:" line callgrind writes at the end of its file).
-instructions() {
-    out="$WORK/$1-$2.out"
-    valgrind --tool=callgrind --callgrind-out-file="$out" "$BENCH" dispatch "$1" "$2" \
-        >/dev/null 2>"$WORK/$1-$2.log"
-    awk '/^totals:/ { print $2 }' "$out"
-}
-
-per_event() {
-    zero=$(instructions "$1" 0)
-    many=$(instructions "$1" "$EVENTS")
-    awk -v a="$zero" -v b="$many" -v n="$EVENTS" 'BEGIN { printf "%.1f", (b - a) / n }'
-}
+per_event() { per_unit %.1f dispatch "$1"; }
 
 plain=$(per_event plain)
 zu=$(per_event zu)

@@ -8,24 +8,10 @@ set -eu
 BUILD_DIR=${1:-build}
 CELLS=${2:-10000}
 BENCH="$BUILD_DIR/bench/bench_tabstopdelegate"
-[ -x "$BENCH" ] || { echo "no $BENCH; build the target bench_tabstopdelegate first" >&2; exit 2; }
-command -v valgrind >/dev/null || { echo "valgrind is not installed" >&2; exit 2; }
-export QT_QPA_PLATFORM=offscreen
-WORK=$(mktemp -d)
-trap 'rm -rf "$WORK"' EXIT
+COUNT=$CELLS
+. "$(dirname "$0")/callgrind_common.sh"
 
-instructions() {
-    out="$WORK/$1-$2.out"
-    valgrind --tool=callgrind --callgrind-out-file="$out" "$BENCH" "$1" "$2" \
-        >/dev/null 2>"$WORK/$1-$2.log"
-    awk '/^totals:/ { print $2 }' "$out"
-}
-
-per_cell() {
-    zero=$(instructions "$1" 0)
-    many=$(instructions "$1" "$CELLS")
-    awk -v a="$zero" -v b="$many" -v n="$CELLS" 'BEGIN { printf "%.0f", (b - a) / n }'
-}
+per_cell() { per_unit %.0f "$1"; }
 
 plain=$(per_cell plain)
 proxy=$(per_cell proxy)
