@@ -19,10 +19,11 @@
 #include <QLinearGradient>
 #include <QMenu>
 #include <QPainter>
-#include <QPointer>
 #include <QPushButton>
 #include <QStandardItemModel>
 #include <QTableView>
+
+#include <memory>
 
 namespace {
 
@@ -171,18 +172,22 @@ DemoWidgetsViewsPage::DemoWidgetsViewsPage(QWidget* inParent) : QWidget(inParent
     auto* send = new QPushButton(tr("Send to archive"), this);
     send->setCheckable(true);
     send->setIcon(QIcon(QStringLiteral(":images/DicomJobProcessing00")));
-    connect(send, &QPushButton::toggled, send, [send](bool inSending) {
-        // The removal at destruction calls the setter once more: by then the button is gone.
-        QPointer<QPushButton> button(send);
+    // The removal at destruction calls the setter once more: by then the button is no longer a
+    // QPushButton, so the setter must not touch it.
+    auto alive = std::make_shared<bool>(true);
+    connect(send, &QPushButton::toggled, send, [send, alive](bool inSending) {
         if (inSending)
-            ZuAnimatedProgressIcon::setIconTo(send, [button](const QIcon& inIcon) {
-                if (button)
-                    button->setIcon(inIcon);
+            ZuAnimatedProgressIcon::setIconTo(send, [send, alive](const QIcon& inIcon) {
+                if (*alive)
+                    send->setIcon(inIcon);
             });
         else
             ZuAnimatedProgressIcon::removeIconFrom(send);
     });
-    connect(send, &QObject::destroyed, [send] { ZuAnimatedProgressIcon::removeIconFrom(send); });
+    connect(send, &QObject::destroyed, [send, alive] {
+        *alive = false;
+        ZuAnimatedProgressIcon::removeIconFrom(send);
+    });
     send->setChecked(true);
     form->addRow(tr("Animated icon:"), send);
     layout->addLayout(form, 1, 1, 1, 2);

@@ -116,7 +116,8 @@ void TestFile::wholeFiles()
     QFETCH(QString, logged);
     if (!path.startsWith('/'))
         path = mTemp.filePath(path);
-    const QByteArray old("hi\n\0\1\xff and more", 17), data("new content\n");
+    static const char kOld[] = "hi\n\0\1\xff and more"; // bytes no text codec keeps
+    const QByteArray old(kOld, sizeof kOld - 1), data("new content\n");
     makeFile(mTemp.filePath("old.bin"), old);
     QDir().mkpath(mTemp.filePath("dir"));
 

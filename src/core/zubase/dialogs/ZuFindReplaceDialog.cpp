@@ -88,7 +88,9 @@ public:
 
 bool ZuFindReplaceDialog::Private::eventFilter(QObject* inWatched, QEvent* inEvent)
 {
-    if (inWatched == document.data() && inEvent->type() == QEvent::PaletteChange) {
+    // The type first: a text edit in its destructor still sends events, and the guarded
+    // pointer may not be read as a QTextEdit then.
+    if (inEvent->type() == QEvent::PaletteChange && inWatched == document.data()) {
         recolourMarks();
     } else if (inEvent->type() == QEvent::KeyPress &&
                (inWatched == findField || inWatched == replaceField)) {
